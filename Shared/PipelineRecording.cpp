@@ -1,0 +1,139 @@
+#include "Shared/PipelineRecording.h"
+
+#include "Shared/RecordingContainer.h"
+#include "Shared/Util/Numeric.h"
+
+#include <algorithm>
+#include <stdexcept>
+#include <utility>
+
+namespace ZorvaTouch {
+namespace {
+
+/// A recorded gap may be years long (a broken time stamp); nobody waits longer than an hour for a frame.
+constexpr std::uint64_t kLongestSleepUs = 3'600'000'000;
+
+FrameList framesFromJson(std::optional<std::string_view> jsonData) {
+    if (!jsonData)
+        throw std::invalid_argument("json not supplied");
+    return readRecordingContainer(*jsonData).frames;
+}
+
+} // namespace
+
+PipelineRecording::PipelineRecording(Ports::Clock &clock) : PipelineRecording(FrameList(), clock) {}
+
+PipelineRecording::PipelineRecording(std::optional<std::string_view> jsonData, Ports::Clock &clock)
+    : PipelineRecording(framesFromJson(jsonData), clock) {}
+
+PipelineRecording::PipelineRecording(FrameList frames, Ports::Clock &clock)
+    : _clock(&clock), _ticks(clock), _frames(std::move(frames)) {}
+
+PipelineRecording::PipelineRecording(const PipelineRecording &other)
+    : PipelineInput(other), pipeline(other.pipeline), _clock(other._clock), _ticks(other._ticks),
+      _frames(other._frames), _maxFrameCount(other._maxFrameCount) {}
+
+PipelineRecording &PipelineRecording::operator=(const PipelineRecording &other) {
+    if (this != &other)
+        *this = PipelineRecording(other);
+    return *this;
+}
+
+void PipelineRecording::setState(std::uint64_t timestamp, const std::string &key,
+                                 const PropertyValue &value) {
+    appendFrame({FrameType::State, _ticks.nanosecondsFromMachTime(timestamp), key, value, {}});
+    if (pipeline)
+        pipeline->setState(timestamp, key, value);
+}
+
+void PipelineRecording::handleInputReport(std::uint64_t timestamp, const std::uint8_t *data,
+                                          std::size_t length) {
+    _frames.appendReport(_ticks.nanosecondsFromMachTime(timestamp), {data, length});
+    frameAppended();
+    if (pipeline)
+        pipeline->handleInputReport(timestamp, data, length);
+}
+
+void PipelineRecording::handleMetadata(std::uint64_t timestamp, const std::string &key,
+                                       const PropertyValue &value) {
+    appendFrame({FrameType::Metadata, _ticks.nanosecondsFromMachTime(timestamp), key, value, {}});
+    if (pipeline)
+        pipeline->handleMetadata(timestamp, key, value);
+}
+
+void PipelineRecording::appendFrame(Frame frame) {
+    _frames.append(std::move(frame));
+    frameAppended();
+}
+
+void PipelineRecording::frameAppended() {
+    _play.valid = false;
+    // Only at twice the bound, and then down to the bound: that makes trims rare.
+    const bool isDue = _maxFrameCount != 0 && _frames.size() / 2 >= _maxFrameCount;
+    if (isDue)
+        trim();
+}
+
+void PipelineRecording::setMaxFrameCount(std::uint64_t count) {
+    _maxFrameCount = count;
+    if (count != 0)
+        trim();
+}
+
+void PipelineRecording::trim() { _play.position = _frames.trim(_maxFrameCount, _play.position); }
+
+std::string PipelineRecording::json() {
+    if (_maxFrameCount != 0)
+        trim();
+    _play.position = _frames.sort(_play.position);
+    return writeRecordingContainer(_frames);
+}
+
+PropertyValue PipelineRecording::migrateSerializedContainer(const PropertyValue &object) {
+    return migrateRecordingContainer(object);
+}
+
+void PipelineRecording::playReset() {
+    _play = {
+        .valid = true, .position = 0, .startTimeMach = _clock->nowTicks(), .lastFrameTimeNs = std::nullopt};
+}
+
+bool PipelineRecording::playCanContinue() const noexcept {
+    return _play.valid && _play.position < _frames.size();
+}
+
+void PipelineRecording::playNextFrame(float speed) {
+    if (!playCanContinue())
+        throw std::runtime_error("playback finished");
+    const Frame frame =
+        _frames[_play.position++].toFrame(); // a copy: the pipeline may record into this very list
+    const std::uint64_t offsetNs = frame.timestampNs - (*_frames.begin()).timestampNs;
+    waitForFrame(frame.timestampNs, speed);
+    _play.lastFrameTimeNs = frame.timestampNs;
+    forward(frame, _play.startTimeMach + _ticks.machTimeFromNanoseconds(offsetNs));
+}
+
+void PipelineRecording::waitForFrame(std::uint64_t timestampNs, float speed) {
+    if (!_play.lastFrameTimeNs || timestampNs <= *_play.lastFrameTimeNs)
+        return;
+    const float factor = speed <= 0.0f ? 1.0f : speed; // NaN is not less: it is kept and makes every delay 0
+    const float delayUs = static_cast<float>(timestampNs - *_play.lastFrameTimeNs) / factor / 1000.0f;
+    const std::uint64_t sleepUs = Util::truncateToUint64(static_cast<double>(delayUs));
+    if (sleepUs != 0)
+        _clock->sleepMicroseconds(std::min(sleepUs, kLongestSleepUs));
+}
+
+void PipelineRecording::forward(const Frame &frame, std::uint64_t timestamp) {
+    if (!pipeline)
+        return;
+    switch (frame.type) {
+    case FrameType::State:
+        return pipeline->setState(timestamp, frame.key, frame.value);
+    case FrameType::InputReport:
+        return pipeline->handleInputReport(timestamp, frame.data.data(), frame.data.size());
+    case FrameType::Metadata:
+        return pipeline->handleMetadata(timestamp, frame.key, frame.value);
+    }
+}
+
+} // namespace ZorvaTouch

@@ -1,0 +1,555 @@
+#include "Shared/FrameList.h"
+
+#include "Tests/Support/RecordingFakes.h"
+
+#include <gtest/gtest.h>
+
+#include <utility>
+
+// Frames are written in short hand: R7 is a report, M7 a metadata item, a=1 a write of 1 to the state "a".
+
+namespace ZorvaTouch {
+namespace {
+
+using Scripted::framesFromShortHand;
+using Scripted::framesOf;
+using Scripted::listFromShortHand;
+using Scripted::metadataFrame;
+using Scripted::patternedReport;
+using Scripted::reportFrame;
+using Scripted::shortHand;
+using Scripted::stateFrame;
+
+std::string trimmed(const char *frames, std::uint64_t maxCount) {
+    FrameList list = listFromShortHand(frames);
+    list.trim(maxCount);
+    return shortHand(list);
+}
+
+/// Where trimming takes the cursor.
+std::size_t cursorAfterTrim(const char *frames, std::uint64_t maxCount, std::size_t cursor) {
+    return listFromShortHand(frames).trim(maxCount, cursor);
+}
+
+/// A list of `count` one-byte reports at the times 0, 1, 2 ...; the byte is the time modulo 256.
+FrameList numberedReports(std::size_t count) {
+    FrameList list;
+    for (std::size_t i = 0; i < count; ++i)
+        list.appendReport(i, std::vector<std::uint8_t>{static_cast<std::uint8_t>(i)});
+    return list;
+}
+
+void expectNumberedReports(const FrameList &list, std::size_t first, std::size_t count) {
+    ASSERT_EQ(list.size(), count);
+    std::size_t expected = first;
+    for (const FrameView frame : list) {
+        ASSERT_EQ(frame.timestampNs, expected);
+        ASSERT_EQ(frame.data.size(), 1u);
+        ASSERT_EQ(frame.data[0], static_cast<std::uint8_t>(expected));
+        ++expected;
+    }
+    ASSERT_EQ(expected, first + count);
+}
+
+// --- Appending and reading -----------------------------------------------------------------------
+
+TEST(FrameList, IsEmptyAtFirst) {
+    FrameList list;
+    EXPECT_TRUE(list.empty());
+    EXPECT_EQ(list.size(), 0u);
+    EXPECT_TRUE(list.begin() == list.end());
+    EXPECT_EQ(list.trim(5), 0u);
+    EXPECT_EQ(list.trim(0), 0u);
+    EXPECT_EQ(list.sort(), 0u);
+    EXPECT_TRUE(list.empty());
+}
+
+TEST(FrameList, KeepsFramesOfEveryKindWhole) {
+    const std::vector<Frame> frames{
+        stateFrame(18446744073709551615u, "Algs.ActivationThreshold", 250.5),
+        reportFrame(7, {1, 0, 255}),
+        metadataFrame(0, "Accel",
+                      PropertyValue::Dictionary{{"x", PropertyValue::Array{1u, "two", PropertyValue()}}}),
+        stateFrame(3, "", PropertyValue()),
+        metadataFrame(3, std::string("nul\0key", 7), std::string(1000, 'v')),
+    };
+    FrameList list;
+    for (const Frame &frame : frames)
+        list.append(frame);
+    EXPECT_EQ(framesOf(list), frames);
+    for (std::size_t i = 0; i < frames.size(); ++i)
+        EXPECT_EQ(list[i].toFrame(), frames[i]) << i;
+}
+
+TEST(FrameList, AReportIsTheSameEitherWayItIsAdded) {
+    for (const std::size_t length : {0u, 1u, 73u, 76u, 77u, 512u, 600u, 70000u}) {
+        FrameList byFrame;
+        FrameList byBytes;
+        const auto bytes = patternedReport(length, 1);
+        byFrame.append(reportFrame(5, bytes));
+        byBytes.appendReport(5, bytes);
+        EXPECT_EQ(framesOf(byFrame), framesOf(byBytes)) << length;
+        EXPECT_EQ(framesOf(byBytes).at(0), reportFrame(5, bytes)) << length;
+    }
+}
+
+TEST(FrameList, KeepsReportsOfEveryLengthByteForByte) {
+    // Long and short ones side by side, over several chunks, so that each stands next to each.
+    const std::vector<std::size_t> lengths{0,  1,  73,  76,  77,  512, 600,   70000,
+                                           75, 78, 255, 256, 511, 513, 65535, 65536};
+    FrameList list;
+    std::vector<Frame> frames;
+    for (std::size_t i = 0; i < 200; ++i) {
+        const auto bytes = patternedReport(lengths[(i * 7) % lengths.size()], static_cast<std::uint8_t>(i));
+        frames.push_back(reportFrame(i, bytes));
+        list.appendReport(i, bytes);
+    }
+    EXPECT_EQ(framesOf(list), frames);
+    list.trim(130);
+    EXPECT_EQ(framesOf(list), std::vector<Frame>(frames.end() - 130, frames.end()));
+}
+
+TEST(FrameList, CopiesTheReport) {
+    std::vector<std::uint8_t> bytes{1, 2, 3};
+    FrameList list;
+    list.appendReport(1, bytes);
+    bytes.assign(3, 0);
+    EXPECT_EQ(list[0].toFrame(), reportFrame(1, {1, 2, 3}));
+}
+
+TEST(FrameList, ASlotUsedAgainShowsNothingOfItsLastFrame) {
+    // Every chunk that is dropped comes back: with long reports, keys and values first, then with bare
+    // frames.
+    FrameList list;
+    for (std::size_t round = 0; round < 6; ++round) {
+        for (std::size_t i = 0; i < 64; ++i)
+            list.append(metadataFrame(i, "key", "value"));
+        for (std::size_t i = 0; i < 64; ++i)
+            list.appendReport(i, patternedReport(600, 1));
+        list.trim(1);
+    }
+    list.trim(0);
+    EXPECT_TRUE(list.empty());
+    std::vector<Frame> frames;
+    for (std::size_t i = 0; i < 256; ++i) {
+        frames.push_back(i % 2 ? reportFrame(i, {}) : stateFrame(i, "", PropertyValue()));
+        list.append(frames.back());
+    }
+    EXPECT_EQ(framesOf(list), frames);
+}
+
+TEST(FrameList, ChunkBordersDoNotShow) {
+    for (const std::size_t count : {1u, 63u, 64u, 65u, 127u, 128u, 129u, 192u, 8699u, 8700u}) {
+        SCOPED_TRACE(count);
+        const FrameList list = numberedReports(count);
+        expectNumberedReports(list, 0, count);
+        for (const std::size_t index : {std::size_t{0}, count / 2, count - 1})
+            EXPECT_EQ(list[index].timestampNs, index);
+    }
+}
+
+// --- Trimming ------------------------------------------------------------------------------------
+
+TEST(FrameList, TrimKeepsTheStateThatTheKeptStretchBeganWith) {
+    EXPECT_EQ(trimmed("R1 a=1 R2 a=2 a=3 R3 R4", 2), "a=3 R3 R4");
+}
+
+TEST(FrameList, TrimKeepsTheLastWriteBetweenTwoKeptFrames) {
+    EXPECT_EQ(trimmed("R1 a=1 a=2 b=1 a=3 R2 a=4 a=5 R3", 2), "b=1 a=3 R2 a=5 R3");
+    EXPECT_EQ(trimmed("R1 a=1 a=2 b=1 a=3 R2 a=4 a=5 R3", 3), "R1 b=1 a=3 R2 a=5 R3");
+}
+
+TEST(FrameList, TrimKeepsTheNewestWritesAfterTheLastFrame) {
+    EXPECT_EQ(trimmed("R1 a=1 b=1 a=2", 5), "R1 b=1 a=2");
+    EXPECT_EQ(trimmed("a=1 R1 a=2", 1), "a=1 R1 a=2") << "both matter: one before the report, one after it";
+}
+
+TEST(FrameList, TrimToNothingKeepsTheNewestWriteOfEachKey) {
+    EXPECT_EQ(trimmed("a=1 R1 b=1 R2 a=2 M3 c=1", 0), "b=1 a=2 c=1");
+    EXPECT_EQ(trimmed("R1 R2 M3", 0), "");
+}
+
+TEST(FrameList, TrimThinsOutStatesEvenBelowTheBound) {
+    EXPECT_EQ(trimmed("a=1 a=2 R1 a=3", 100), "a=2 R1 a=3");
+    EXPECT_EQ(trimmed("a=1 b=1 a=2 b=2 a=3", 100), "b=2 a=3");
+}
+
+TEST(FrameList, TrimCountsMetadataAsFrames) {
+    EXPECT_EQ(trimmed("R1 M2 a=1 R3 M4", 2), "a=1 R3 M4");
+    EXPECT_EQ(trimmed("R1 M2 a=1 R3 M4", 3), "M2 a=1 R3 M4");
+}
+
+TEST(FrameList, TrimDoesNotCountStates) {
+    EXPECT_EQ(trimmed("R1 a=1 b=1 c=1 d=1 R2", 1), "a=1 b=1 c=1 d=1 R2");
+    EXPECT_EQ(trimmed("R1 a=1 b=1 c=1 d=1 R2", 2), "R1 a=1 b=1 c=1 d=1 R2");
+}
+
+TEST(FrameList, TrimLeavesAListWithinTheBoundAlone) {
+    EXPECT_EQ(trimmed("R1 R2 R3", 3), "R1 R2 R3");
+    EXPECT_EQ(trimmed("R1 R2 R3", 4), "R1 R2 R3");
+    EXPECT_EQ(trimmed("R1 R2 R3", 18446744073709551615u), "R1 R2 R3");
+    EXPECT_EQ(trimmed("R1 R2 R3", 2), "R2 R3");
+    EXPECT_EQ(trimmed("R1 R2 R3", 1), "R3");
+}
+
+TEST(FrameList, TrimTwiceIsTrimOnce) {
+    FrameList list = listFromShortHand("R1 a=1 R2 b=1 a=2 a=3 R3 b=2 R4 a=4 b=3");
+    list.trim(2);
+    EXPECT_EQ(shortHand(list), "b=1 a=3 R3 b=2 R4 a=4 b=3");
+    list.trim(2);
+    EXPECT_EQ(shortHand(list), "b=1 a=3 R3 b=2 R4 a=4 b=3");
+}
+
+TEST(FrameList, AListOfStateWritesShrinksToOneOfEach) {
+    FrameList list;
+    for (std::uint64_t i = 0; i < 1000; ++i)
+        list.append(stateFrame(i, i % 2 ? "odd" : "even", i));
+    EXPECT_EQ(list.trim(7, 500), 0u);
+    EXPECT_EQ(framesOf(list),
+              (std::vector<Frame>{stateFrame(998, "even", 998u), stateFrame(999, "odd", 999u)}));
+}
+
+TEST(FrameList, ManyKeysAreAllKept) {
+    // 500 keys, each written three times, then one report: the third round survives.
+    FrameList list;
+    std::vector<Frame> lastRound;
+    for (std::uint64_t i = 0; i < 1500; ++i) {
+        const Frame frame = stateFrame(i, "key" + std::to_string(i % 500), i);
+        list.append(frame);
+        if (i >= 1000)
+            lastRound.push_back(frame);
+    }
+    list.append(reportFrame(1500, {1}));
+    lastRound.push_back(reportFrame(1500, {1}));
+    list.trim(1);
+    EXPECT_EQ(framesOf(list), lastRound);
+}
+
+TEST(FrameList, KeysAreComparedWhole) {
+    FrameList list;
+    const std::string longKey(300, 'k');
+    std::vector<Frame> frames;
+    for (const std::string &key : {std::string("a"), std::string("a\0", 2), std::string("A"), std::string(),
+                                   longKey, longKey + "k", std::string("a\0b", 3)})
+        frames.push_back(stateFrame(1, key, key));
+    for (const Frame &frame : frames)
+        list.append(frame);
+    list.trim(1);
+    EXPECT_EQ(framesOf(list), frames);
+}
+
+TEST(FrameList, TrimWorksAtChunkBorders) {
+    for (const std::size_t count : {63u, 64u, 65u, 128u, 8699u, 8700u}) {
+        for (const std::size_t bound : {0u, 1u, 62u, 63u, 64u, 65u, 128u, 4350u, 8699u}) {
+            SCOPED_TRACE(std::to_string(count) + " frames, bound " + std::to_string(bound));
+            FrameList list = numberedReports(count);
+            list.trim(bound);
+            const std::size_t kept = std::min(count, bound);
+            expectNumberedReports(list, count - kept, kept);
+            list.appendReport(count, std::vector<std::uint8_t>{static_cast<std::uint8_t>(count)});
+            expectNumberedReports(list, count - kept, kept + 1);
+        }
+    }
+}
+
+TEST(FrameList, StatesInDroppedChunksAreCarriedOver) {
+    // The one write stands 300 reports before the stretch that is kept.
+    FrameList list;
+    list.append(stateFrame(0, "a", "early"));
+    for (std::uint64_t i = 1; i <= 400; ++i)
+        list.appendReport(i, std::vector<std::uint8_t>{1});
+    list.trim(100);
+    ASSERT_EQ(list.size(), 101u);
+    EXPECT_EQ(list[0].toFrame(), stateFrame(0, "a", "early"));
+    EXPECT_EQ(list[1].timestampNs, 301u);
+    EXPECT_EQ(list[100].timestampNs, 400u);
+}
+
+TEST(FrameList, ABoundedListStaysWhatItIsOverManyRounds) {
+    FrameList list;
+    for (std::uint64_t i = 0; i < 20000; ++i) {
+        if (i % 10 == 0)
+            list.append(stateFrame(i, "tens", i));
+        list.appendReport(i, patternedReport(i % 100, static_cast<std::uint8_t>(i)));
+        if (list.size() >= 200)
+            list.trim(100);
+    }
+    list.trim(100);
+    // The reports 19900 to 19999, a write before every tenth of them.
+    ASSERT_EQ(list.size(), 110u);
+    EXPECT_EQ(list[0].toFrame(), stateFrame(19900, "tens", 19900u));
+    EXPECT_EQ(list[1].toFrame(), reportFrame(19900, patternedReport(0, static_cast<std::uint8_t>(19900))));
+    EXPECT_EQ(list[109].toFrame(), reportFrame(19999, patternedReport(99, static_cast<std::uint8_t>(19999))));
+}
+
+// --- Cursors -------------------------------------------------------------------------------------
+
+TEST(FrameList, TrimTellsWhereTheFrameWent) {
+    // Kept of R1 a=1 R2 a=2 a=3 R3 R4 are a=3 R3 R4, once at 4, 5 and 6.
+    const char *frames = "R1 a=1 R2 a=2 a=3 R3 R4";
+    EXPECT_EQ(cursorAfterTrim(frames, 2, 4), 0u);
+    EXPECT_EQ(cursorAfterTrim(frames, 2, 5), 1u);
+    EXPECT_EQ(cursorAfterTrim(frames, 2, 6), 2u);
+    EXPECT_EQ(cursorAfterTrim(frames, 2, 7), 3u) << "the end stays the end";
+}
+
+TEST(FrameList, TrimMovesACursorToTheNextKeptFrame) {
+    const char *frames = "R1 a=1 R2 a=2 a=3 R3 R4";
+    for (const std::size_t removed : {0u, 1u, 2u, 3u})
+        EXPECT_EQ(cursorAfterTrim(frames, 2, removed), 0u) << removed;
+    EXPECT_EQ(cursorAfterTrim("a=1 R1 b=1 R2 a=2", 1, 1), 1u) << "R1 goes, b=1 is next; a=1 stays before it";
+    EXPECT_EQ(cursorAfterTrim("b=1 R1", 0, 1), 1u) << "nothing is kept after R1: the end";
+}
+
+TEST(FrameList, TrimMovesACursorAcrossChunks) {
+    FrameList list = numberedReports(1000);
+    EXPECT_EQ(list.trim(500, 499), 0u);
+    list = numberedReports(1000);
+    EXPECT_EQ(list.trim(500, 500), 0u);
+    list = numberedReports(1000);
+    EXPECT_EQ(list.trim(500, 501), 1u);
+    list = numberedReports(1000);
+    EXPECT_EQ(list.trim(500, 999), 499u);
+    list = numberedReports(1000);
+    EXPECT_EQ(list.trim(500, 1000), 500u);
+    list = numberedReports(1000);
+    EXPECT_EQ(list.trim(2000, 777), 777u);
+}
+
+TEST(FrameList, SortTellsWhereTheFrameWent) {
+    const auto sorted = [](std::size_t cursor) {
+        return listFromShortHand("R1@30 R2@10 R3@20 R4@10").sort(cursor); // R2 R4 R3 R1
+    };
+    EXPECT_EQ(sorted(0), 3u);
+    EXPECT_EQ(sorted(1), 0u);
+    EXPECT_EQ(sorted(2), 2u);
+    EXPECT_EQ(sorted(3), 1u);
+    EXPECT_EQ(sorted(4), 4u) << "the end stays the end";
+}
+
+// --- Sorting -------------------------------------------------------------------------------------
+
+TEST(FrameList, SortIsByTimeAndStable) {
+    FrameList list = listFromShortHand("R1@30 a=1@10 M3@20 R4@10 a=2@20 R6@0 R7@30");
+    list.sort();
+    EXPECT_EQ(shortHand(list), "R6 a=1 R4 M3 a=2 R1 R7");
+}
+
+TEST(FrameList, SortComparesTimesAsUnsigned) {
+    FrameList list = listFromShortHand("R1@18446744073709551615 R2@0 R3@9223372036854775808 R4@1");
+    list.sort();
+    EXPECT_EQ(shortHand(list), "R2 R4 R3 R1");
+}
+
+TEST(FrameList, SortTurnsALongListAround) {
+    FrameList list;
+    for (std::size_t i = 0; i < 1000; ++i) {
+        const std::size_t time = 999 - i;
+        list.appendReport(time, std::vector<std::uint8_t>{static_cast<std::uint8_t>(time)});
+    }
+    EXPECT_EQ(list.sort(0), 999u);
+    expectNumberedReports(list, 0, 1000);
+}
+
+TEST(FrameList, SortKeepsALongListOfOneTimeInOrder) {
+    FrameList list;
+    std::vector<Frame> frames;
+    for (std::uint8_t i = 0; i < 200; ++i) {
+        frames.push_back(reportFrame(5, {i}));
+        list.append(frames.back());
+    }
+    EXPECT_EQ(list.sort(123), 123u);
+    EXPECT_EQ(framesOf(list), frames);
+}
+
+TEST(FrameList, ASortedListTakesFramesAndTrims) {
+    FrameList list = listFromShortHand("R1@30 R2@10 R3@20");
+    list.sort();
+    list.append(reportFrame(5, {4}));
+    EXPECT_EQ(shortHand(list), "R2 R3 R1 R4");
+    list.trim(2);
+    EXPECT_EQ(shortHand(list), "R1 R4");
+}
+
+TEST(FrameList, SortKeepsLongReportsWithTheirFrames) {
+    FrameList list;
+    for (std::uint8_t i = 0; i < 130; ++i)
+        list.appendReport(129u - i, patternedReport(i % 2 ? 600u : 73u, i));
+    list.sort();
+    for (std::size_t i = 0; i < 130; ++i) {
+        const auto number = static_cast<std::uint8_t>(129 - i);
+        EXPECT_EQ(list[i].toFrame(), reportFrame(i, patternedReport(number % 2 ? 600u : 73u, number)));
+    }
+}
+
+// --- Copies and moves ----------------------------------------------------------------------------
+
+/// Frames of all kinds over several chunks, in no order of time.
+FrameList mixedList(std::size_t count) {
+    FrameList list;
+    for (std::size_t i = 0; i < count; ++i) {
+        const std::uint64_t time = (i * 37) % 101;
+        if (i % 5 == 0)
+            list.append(stateFrame(time, "key" + std::to_string(i % 3), static_cast<std::uint64_t>(i)));
+        else if (i % 5 == 1)
+            list.append(metadataFrame(time, "note", std::to_string(i)));
+        else
+            list.appendReport(time, patternedReport(i % 3 ? 73 : 600, static_cast<std::uint8_t>(i)));
+    }
+    return list;
+}
+
+using Change = void (*)(FrameList &);
+constexpr Change kChanges[] = {
+    [](FrameList &list) {
+        list.append(reportFrame(1, {1, 2, 3}));
+    },
+    [](FrameList &list) {
+        for (int i = 0; i < 200; ++i)
+            list.appendReport(1, patternedReport(600, 9));
+    },
+    [](FrameList &list) { list.trim(3); },
+    [](FrameList &list) { list.trim(70); },
+    [](FrameList &list) { list.trim(0); },
+    [](FrameList &list) { list.sort(); },
+    [](FrameList &list) { list = FrameList(); },
+    [](FrameList &list) { FrameList gone = std::move(list); },
+    [](FrameList &list) {
+        list.trim(1);
+        for (int i = 0; i < 300; ++i)
+            list.append(metadataFrame(2, "other", "text"));
+    },
+};
+
+TEST(FrameList, ACopyHasTheSameFrames) {
+    for (const std::size_t count : {0u, 1u, 63u, 64u, 65u, 128u, 200u}) {
+        const FrameList original = mixedList(count);
+        const FrameList copy(original);
+        EXPECT_EQ(framesOf(copy), framesOf(original)) << count;
+        FrameList assigned = mixedList(10);
+        assigned = original;
+        EXPECT_EQ(framesOf(assigned), framesOf(original)) << count;
+    }
+}
+
+TEST(FrameList, AChangeOfTheOriginalLeavesTheCopyAlone) {
+    for (const std::size_t count : {0u, 1u, 63u, 64u, 65u, 128u, 200u}) {
+        for (std::size_t i = 0; i < std::size(kChanges); ++i) {
+            FrameList original = mixedList(count);
+            const std::vector<Frame> frames = framesOf(original);
+            const FrameList copy(original);
+            kChanges[i](original);
+            EXPECT_EQ(framesOf(copy), frames) << count << " frames, change " << i;
+        }
+    }
+}
+
+TEST(FrameList, AChangeOfTheCopyLeavesTheOriginalAlone) {
+    for (const std::size_t count : {0u, 1u, 63u, 64u, 65u, 128u, 200u}) {
+        for (std::size_t i = 0; i < std::size(kChanges); ++i) {
+            const FrameList original = mixedList(count);
+            const std::vector<Frame> frames = framesOf(original);
+            FrameList copy;
+            copy = original;
+            kChanges[i](copy);
+            EXPECT_EQ(framesOf(original), frames) << count << " frames, change " << i;
+        }
+    }
+}
+
+TEST(FrameList, BothSidesOfACopyGoTheirOwnWay) {
+    FrameList original = listFromShortHand("R1 R2 R3");
+    FrameList copy(original);
+    original.append(reportFrame(4, {4}));
+    copy.append(reportFrame(4, {5}));
+    EXPECT_EQ(shortHand(original), "R1 R2 R3 R4");
+    EXPECT_EQ(shortHand(copy), "R1 R2 R3 R5");
+    original.trim(2);
+    copy.sort();
+    EXPECT_EQ(shortHand(original), "R3 R4");
+    EXPECT_EQ(shortHand(copy), "R1 R2 R3 R5");
+}
+
+TEST(FrameList, ACopyOutlivesItsOriginal) {
+    FrameList copy;
+    std::vector<Frame> frames;
+    {
+        const FrameList original = mixedList(200);
+        frames = framesOf(original);
+        copy = original;
+    }
+    EXPECT_EQ(framesOf(copy), frames);
+}
+
+TEST(FrameList, CopiesOfCopiesStayApart) {
+    FrameList first = mixedList(150);
+    const std::vector<Frame> frames = framesOf(first);
+    std::vector<FrameList> copies(4, first);
+    copies.emplace_back(copies.front());
+    first.trim(5);
+    copies[0].trim(9);
+    copies[1].sort();
+    copies[2] = copies[0];
+    EXPECT_EQ(framesOf(copies[2]), framesOf(copies[0]));
+    EXPECT_EQ(framesOf(copies[3]), frames);
+    EXPECT_EQ(framesOf(copies[4]), frames);
+}
+
+TEST(FrameList, SelfAssignmentChangesNothing) {
+    FrameList list = mixedList(150);
+    const std::vector<Frame> frames = framesOf(list);
+    FrameList &same = list;
+    list = same;
+    EXPECT_EQ(framesOf(list), frames);
+    list = std::move(same);
+    EXPECT_EQ(framesOf(list), frames);
+    list.append(reportFrame(1, {1}));
+    EXPECT_EQ(list.size(), 151u);
+}
+
+TEST(FrameList, AMovedFromListIsEmptyAndOfUse) {
+    for (const std::size_t count : {1u, 64u, 200u}) {
+        FrameList list = mixedList(count);
+        const std::vector<Frame> frames = framesOf(list);
+        FrameList target(std::move(list));
+        EXPECT_EQ(framesOf(target), frames);
+        EXPECT_TRUE(list.empty()); // NOLINT(bugprone-use-after-move): that is what is tested
+        EXPECT_TRUE(list.begin() == list.end());
+        EXPECT_EQ(list.trim(1), 0u);
+        EXPECT_EQ(list.sort(), 0u);
+        list.append(reportFrame(9, {9}));
+        EXPECT_EQ(shortHand(list), "R9");
+
+        FrameList assigned = mixedList(70);
+        assigned = std::move(target);
+        EXPECT_EQ(framesOf(assigned), frames);
+        EXPECT_TRUE(target.empty()); // NOLINT(bugprone-use-after-move)
+        target.appendReport(8, std::vector<std::uint8_t>{8});
+        EXPECT_EQ(shortHand(target), "R8");
+        EXPECT_EQ(framesOf(assigned), frames);
+    }
+}
+
+TEST(FrameList, ListsCanBeSwapped) {
+    FrameList left = mixedList(100);
+    FrameList right = listFromShortHand("R1 R2");
+    const std::vector<Frame> frames = framesOf(left);
+    std::swap(left, right);
+    EXPECT_EQ(shortHand(left), "R1 R2");
+    EXPECT_EQ(framesOf(right), frames);
+    left.append(reportFrame(3, {3}));
+    EXPECT_EQ(shortHand(left), "R1 R2 R3");
+}
+
+TEST(FrameList, FrameViewsTurnIntoFramesThatLast) {
+    Frame kept;
+    {
+        FrameList list;
+        list.append(metadataFrame(1, "a key that is longer than a short string", "value"));
+        kept = list[0].toFrame();
+    }
+    EXPECT_EQ(kept, metadataFrame(1, "a key that is longer than a short string", "value"));
+}
+
+} // namespace
+} // namespace ZorvaTouch
