@@ -38,7 +38,7 @@ struct EventStats {
     std::uint64_t numRejectedVolumeDecrement = 0;   ///< likewise, volume down
     std::uint64_t numSuppressed2Holding = 0;        ///< suppressed holds that became holds
     std::uint64_t numHolding2Suppressed = 0;        ///< holds that became suppressed; 0 unless suppression is
-                                             ///< switched off during a suppressed hold
+                                                    ///< switched off during a suppressed hold
 
     void Reset() noexcept { *this = EventStats(); }
 

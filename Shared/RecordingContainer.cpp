@@ -38,6 +38,8 @@ constexpr std::string_view kInputReportName = kTypeNames[1].name;
 // --- Writing
 // -------------------------------------------------------------------------------------------------------
 
+bool hasName(FrameType type) { return static_cast<std::size_t>(type) < kTypeNames.size(); }
+
 std::string_view nameOf(FrameType type) { return kTypeNames[static_cast<std::size_t>(type)].name; }
 
 void appendFrame(std::string &text, const FrameView &frame) {
@@ -339,6 +341,8 @@ std::string writeRecordingContainer(const FrameList &frames) {
     text.reserve(text.size() + frames.size() * kTypicalFrameLength);
     const char *separator = "";
     for (const FrameView &frame : frames) {
+        if (!hasName(frame.type)) // a kind that the format does not know
+            continue;
         text.append(separator);
         appendFrame(text, frame);
         separator = ",";
