@@ -80,6 +80,21 @@ PixelRegion pullFromElectrodeK(PixelRegion region, const StrongestPair &stronges
     return region;
 }
 
+/// Electrode of the channel with the largest positive normalized value; 0 if none is positive.
+std::int32_t findStrongestElectrode(const Pixels &pixels, const VirtualPixels &virtualPixels) noexcept {
+    float best = 0;
+    std::int32_t bestIndex = 0;
+    const auto look = [&](const Pixel &pixel) {
+        if (pixel.normalizedValue > best) {
+            best = pixel.normalizedValue;
+            bestIndex = pixel.index;
+        }
+    };
+    std::for_each(pixels.begin(), pixels.end(), look);
+    std::for_each(virtualPixels.begin(), virtualPixels.end(), look);
+    return bestIndex;
+}
+
 template <typename Channels> std::int32_t countBystanders(const Channels &channels) noexcept {
     return static_cast<std::int32_t>(std::count_if(channels.begin(), channels.end(), [](const Pixel &pixel) {
         return pixel.wasAboveFloor && !pixel.wasTouched;
@@ -92,8 +107,6 @@ template <typename Channels> std::int32_t countBystanders(const Channels &channe
 struct HandStats::FrameScan {
     bool anyAbove = false;
     bool anyTouched = false;
-    float best = 0;
-    std::int32_t bestIndex = 0; ///< electrode of the strongest channel
 };
 
 void HandStats::SetDecayParameters() noexcept { decayParameter = kDefaultDecayParameter; }
@@ -110,7 +123,7 @@ void HandStats::updateHandState(const Pixels &pixels, const VirtualPixels &virtu
     const FrameScan scan = scanChannels(pixels, virtualPixels);
     updateTouching(scan);
     if (isTouching)
-        activeRegion = isHolding ? changeActiveRegion(pixels, scan.bestIndex)
+        activeRegion = isHolding ? changeActiveRegion(pixels, findStrongestElectrode(pixels, virtualPixels))
                                  : updateActiveRegion(pixels, virtualPixels, now);
     updateEdgeTimes(now);
     updateTouchScore(pixels, virtualPixels, now);
@@ -124,17 +137,12 @@ HandStats::FrameScan HandStats::scanChannels(const Pixels &pixels,
                                              const VirtualPixels &virtualPixels) noexcept {
     FrameScan scan;
     const auto look = [this, &scan](const Pixel &pixel) {
-        const float strength = std::max(0.0f, pixel.normalizedValue); // NaN counts as 0
         scan.anyAbove |= pixel.isAboveFloor;
-        if (strength > scan.best) {
-            scan.best = strength;
-            scan.bestIndex = pixel.index;
-        }
         if (!pixel.isTouched)
             return;
         scan.anyTouched = true;
-        if (strength > maxTouchedValue) {
-            maxTouchedValue = strength;
+        if (pixel.normalizedValue > maxTouchedValue) { // which is 0 at least: negative values never count
+            maxTouchedValue = pixel.normalizedValue;
             maxTouchedIndex = pixel.index;
         }
     };

@@ -20,10 +20,9 @@ constexpr std::array<float, kElectrodeCount> kElectrodeGains{1.9219f, 1.8833f, 1
 
 void Pixel::updatePixelState(std::int32_t raw, float activationThreshold) noexcept {
     value = Util::truncateToInt32(gain * static_cast<float>(raw));
-    const float threshold =
-        isTouched ? peakValue * kReleaseRatio : std::max(valleyValue / kReleaseRatio, 1.0f);
     normalizedValue = static_cast<float>(value) / activationThreshold;
-    isTouched = normalizedValue > threshold;
+    isTouched = isTouched ? normalizedValue > peakValue * kReleaseRatio
+                          : normalizedValue > 1.0f && normalizedValue > valleyValue / kReleaseRatio;
     if (isTouched) {
         peakValue = normalizedValue > peakValue ? normalizedValue : peakValue;
         valleyValue = normalizedValue;

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <functional>
+#include <limits>
 
 namespace ZorvaTouch {
 namespace {
@@ -29,16 +30,54 @@ constexpr std::array<Rank, kChannelCount> kModel{{
 }};
 constexpr float kModelBias = 2.0083f;
 
+/// The channels' values; the classifier looks at them from strongest to weakest. Only values are sorted:
+/// equal ones cannot be told apart.
 using Profile = std::array<std::int32_t, kChannelCount>;
 
-/// All channels' values, strongest first. Only the values are sorted: equal ones cannot be told apart.
-Profile rankValues(const Pixels &pixels, const VirtualPixels &virtualPixels) noexcept {
+Profile gatherValues(const Pixels &pixels, const VirtualPixels &virtualPixels) noexcept {
     Profile profile;
     const auto valueOf = [](const Pixel &pixel) { return pixel.value; };
     const auto middle = std::transform(pixels.begin(), pixels.end(), profile.begin(), valueOf);
     std::transform(virtualPixels.begin(), virtualPixels.end(), middle, valueOf);
-    std::sort(profile.begin(), profile.end(), std::greater<>());
     return profile;
+}
+
+/// Whether there is anything to classify. Needs no order: the second strongest is above the floor if two are.
+bool opensGate(const Profile &profile, float activationThreshold) noexcept {
+    const std::int32_t strongest = *std::max_element(profile.begin(), profile.end());
+    const auto isAboveFloor = [](std::int32_t value) { return value > kNoiseFloor; };
+    return static_cast<float>(strongest) > activationThreshold ||
+           std::count_if(profile.begin(), profile.end(), isAboveFloor) >= 2;
+}
+
+/// Bits of a key below the value: they hold the channel, so that no two keys are equal.
+constexpr int kChannelBits = 6;
+static_assert(kChannelCount <= 1u << kChannelBits);
+
+bool fitsKey(std::int32_t value) noexcept {
+    constexpr std::int32_t kLimit = std::numeric_limits<std::int32_t>::max() >> kChannelBits;
+    return value > -kLimit && value < kLimit;
+}
+
+/// Strongest first. A value's rank is the number of stronger ones: the counting has no branches and both
+/// loops are vector code, which beats every sort for so few values. Only a virtual pixel with an absurd
+/// factor has values that leave no room for the channel's bits.
+void sortStrongestFirst(Profile &profile) noexcept {
+    if (!std::all_of(profile.begin(), profile.end(), fitsKey)) {
+        std::sort(profile.begin(), profile.end(), std::greater<>());
+        return;
+    }
+    Profile keys;
+    for (std::size_t i = 0; i < kChannelCount; ++i)
+        keys[i] = profile[i] * (1 << kChannelBits) + static_cast<std::int32_t>(i);
+    std::array<std::int32_t, kChannelCount> ranks{};
+    for (const std::int32_t other : keys)
+        for (std::size_t i = 0; i < kChannelCount; ++i)
+            ranks[i] += other > keys[i];
+    Profile sorted;
+    for (std::size_t i = 0; i < kChannelCount; ++i)
+        sorted[static_cast<std::size_t>(ranks[i])] = profile[i];
+    profile = sorted;
 }
 
 } // namespace
@@ -54,14 +93,18 @@ SVM::SVM() noexcept : bias(kModelBias) {
 void SVM::updateSVMScore(const Pixels &pixels, const VirtualPixels &virtualPixels, float activationThreshold,
                          std::uint32_t /*now*/) noexcept {
     score = 0;
-    const Profile profile = rankValues(pixels, virtualPixels);
-    const bool strongestExceeds = static_cast<float>(profile[0]) > activationThreshold;
-    if (!strongestExceeds && profile[1] <= kNoiseFloor)
+    Profile profile = gatherValues(pixels, virtualPixels);
+    if (!opensGate(profile, activationThreshold))
         return;
+    sortStrongestFirst(profile);
+    std::array<float, kChannelCount>
+        terms; // apart from their sum, so that they are computed several at a time
+    for (std::size_t i = 0; i < kChannelCount; ++i)
+        terms[i] = (static_cast<float>(profile[i]) - means[i]) / scales[i] * weights[i];
     // In rank order, every operation rounded to single precision: the score must be the same on every
     // machine.
-    for (std::size_t i = 0; i < kChannelCount; ++i)
-        score += (static_cast<float>(profile[i]) - means[i]) / scales[i] * weights[i];
+    for (const float term : terms)
+        score += term;
     score += bias;
 }
 

@@ -41,21 +41,31 @@ VirtualImage::VirtualImage() noexcept {
 }
 
 void VirtualImage::updateValues(const Pixels &pixels) noexcept {
+    values.fill(0);
+    const auto contributes = [](const Pixel &pixel) { return pixel.value > kNoiseFloor; };
+    if (std::none_of(pixels.begin(), pixels.end(), contributes)) // the sensor at rest
+        return;
+    for (std::size_t i = 0; i < kVirtualPixelCount; ++i)
+        updateGroup(i, pixels);
+}
+
+void VirtualImage::updateGroup(std::size_t group, const Pixels &pixels) noexcept {
     const auto valueOf = [&pixels](std::int32_t electrode) {
         return pixels[static_cast<std::size_t>(electrode)].value;
     };
-    for (std::size_t i = 0; i < kVirtualPixelCount; ++i) {
-        std::uint32_t sum = 0; // unsigned: saturated members wrap instead of overflowing
-        for (const char letter : kGroups[i].name) {
-            const std::int32_t member = electrodeOf(letter);
-            if (valueOf(member) <= kNoiseFloor)
-                continue;
-            sum += static_cast<std::uint32_t>(valueOf(member));
-            if (valueOf(member) > valueOf(dominantIndices[i]))
-                dominantIndices[i] = member;
-        }
-        values[i] = static_cast<std::int32_t>(sum);
+    std::uint32_t sum = 0; // unsigned: saturated members wrap instead of overflowing
+    std::int32_t dominant = dominantIndices[group];
+    for (const char letter : kGroups[group].name) {
+        const std::int32_t member = electrodeOf(letter);
+        const std::int32_t value = valueOf(member);
+        if (value <= kNoiseFloor)
+            continue;
+        sum += static_cast<std::uint32_t>(value);
+        if (value > valueOf(dominant))
+            dominant = member;
     }
+    values[group] = static_cast<std::int32_t>(sum);
+    dominantIndices[group] = dominant;
 }
 
 VirtualPixels makeVirtualPixels(const VirtualImage &image) noexcept {

@@ -29,6 +29,9 @@ public:
     std::array<std::int32_t, kVirtualPixelCount>
         dominantIndices; ///< electrode index; at first the first member
     std::array<float, kVirtualPixelCount> normalizationFactors; ///< unitless; the virtual pixels' gains
+
+private:
+    void updateGroup(std::size_t group, const Pixels &pixels) noexcept;
 };
 
 /// Numbers of the two groups around electrode K that decide its region.

@@ -8,12 +8,12 @@
 namespace ZorvaTouch::Util {
 
 [[nodiscard]] constexpr std::int32_t truncateToInt32(float value) noexcept {
-    // 2^31 is exact in single precision, INT32_MAX is not: compare against the power of two.
-    if (value >= 2147483648.0f)
-        return std::numeric_limits<std::int32_t>::max();
-    if (value <= -2147483648.0f)
-        return std::numeric_limits<std::int32_t>::min();
-    return value == value ? static_cast<std::int32_t>(value) : 0;
+    constexpr float kLimit = 2147483648.0f; // 2^31 is exact in single precision, INT32_MAX is not
+    if (value > -kLimit && value < kLimit)
+        return static_cast<std::int32_t>(value);
+    if (value != value) // NaN
+        return 0;
+    return value > 0.0f ? std::numeric_limits<std::int32_t>::max() : std::numeric_limits<std::int32_t>::min();
 }
 
 [[nodiscard]] constexpr std::uint64_t truncateToUint64(double value) noexcept {

@@ -4,6 +4,9 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <iterator>
+#include <thread>
 #include <utility>
 
 // Frames are written in short hand: R7 is a report, M7 a metadata item, a=1 a write of 1 to the state "a".
@@ -265,6 +268,33 @@ TEST(FrameList, StatesInDroppedChunksAreCarriedOver) {
     EXPECT_EQ(list[100].timestampNs, 400u);
 }
 
+TEST(FrameList, ThinlySpreadStatesSurviveAndStaySharedWithCopies) {
+    // 100 keys, 70 reports after each: of every chunk one write or two are left, over and over.
+    FrameList list;
+    std::vector<Frame> states;
+    for (std::uint64_t i = 0; i < 100; ++i) {
+        states.push_back(stateFrame(i, "key" + std::to_string(i), i));
+        list.append(states.back());
+        for (int j = 0; j < 70; ++j)
+            list.appendReport(i, patternedReport(73, static_cast<std::uint8_t>(j)));
+    }
+    const FrameList whole(list);
+    EXPECT_EQ(list.trim(1, 71 * 50), 50u) << "the write of key 50";
+    std::vector<Frame> expected = states;
+    expected.push_back(reportFrame(99, patternedReport(73, 69)));
+    EXPECT_EQ(framesOf(list), expected);
+    const FrameList thinned(list);
+    list.trim(0);
+    list.append(reportFrame(7, {7}));
+    EXPECT_EQ(framesOf(thinned), expected);
+    expected = states;
+    expected.push_back(reportFrame(7, {7}));
+    EXPECT_EQ(framesOf(list), expected);
+    EXPECT_EQ(whole.size(), 7100u);
+    EXPECT_EQ(whole[71 * 50].toFrame(), states[50]);
+    EXPECT_EQ(whole[7099].toFrame(), reportFrame(99, patternedReport(73, 69)));
+}
+
 TEST(FrameList, ABoundedListStaysWhatItIsOverManyRounds) {
     FrameList list;
     for (std::uint64_t i = 0; i < 20000; ++i) {
@@ -493,6 +523,27 @@ TEST(FrameList, CopiesOfCopiesStayApart) {
     EXPECT_EQ(framesOf(copies[2]), framesOf(copies[0]));
     EXPECT_EQ(framesOf(copies[3]), frames);
     EXPECT_EQ(framesOf(copies[4]), frames);
+}
+
+TEST(FrameList, ACopyMayBeUsedOnAnotherThread) {
+    FrameList list = mixedList(1000);
+    const std::vector<Frame> frames = framesOf(list);
+    for (int round = 0; round < 20; ++round) {
+        std::vector<Frame> seen;
+        std::thread reader([copy = list, &seen]() mutable {
+            seen = framesOf(copy);
+            copy.trim(100);
+            copy.append(reportFrame(1, {1}));
+        });
+        FrameList other(list);
+        list.trim(500);
+        for (int i = 0; i < 300; ++i)
+            list.appendReport(1, patternedReport(73, 1));
+        list.trim(10);
+        reader.join();
+        EXPECT_EQ(seen, frames);
+        list = std::move(other);
+    }
 }
 
 TEST(FrameList, SelfAssignmentChangesNothing) {

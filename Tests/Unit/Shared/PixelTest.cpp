@@ -427,6 +427,18 @@ TEST(Pixel, NegativeThresholdTurnsTheSigns) {
     EXPECT_EQ(pixel.maxNormalizedValue, 0.0f); // -1.5 is not greater than 0
 }
 
+TEST(Pixel, AnEqualValueReplacesNothing) {
+    // -0 and 0 are equal, and their sign tells them apart.
+    Pixel pixel = plainPixel();
+    pixel.updatePixelState(0, -200.0f);
+    EXPECT_TRUE(std::signbit(pixel.normalizedValue));
+    EXPECT_FALSE(std::signbit(pixel.valleyValue));
+    pixel.updatePixelState(100, -kInfinity);
+    EXPECT_TRUE(std::signbit(pixel.normalizedValue));
+    EXPECT_TRUE(pixel.wasAboveFloor);
+    EXPECT_FALSE(std::signbit(pixel.maxNormalizedValue));
+}
+
 TEST(VirtualPixel, IndexIsTheCharacterCodeOfItsFirstLetterUntilTheFirstFrame) {
     const VirtualPixel adef("ADEF", 0.6667f);
     EXPECT_EQ(adef.index, 65); // 'A', not electrode 0: meant, and overwritten by the first frame

@@ -218,6 +218,15 @@ TEST_F(Playback, PassesEveryKindOfFrameOn) {
                                  {FrameType::InputReport, 3, "", {}, {}}}));
 }
 
+TEST_F(Playback, AFrameOfAnyOtherKindOnlyTakesItsTime) {
+    append("R1@0");
+    recording.appendFrame({static_cast<FrameType>(3), 10000000, "k", 1u, {2}});
+    append("R3@15000000");
+    playAll(1.0f);
+    EXPECT_EQ(takePlayed(), "R1 R3");
+    EXPECT_EQ(clock.pausesUs(), (Times{10000, 5000}));
+}
+
 TEST_F(Playback, PlaysInListOrder) {
     append("R1@30 R2@10 R3@20");
     playAll(1.0f);

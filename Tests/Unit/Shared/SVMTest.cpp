@@ -123,6 +123,30 @@ TEST(SVM, LargestValuesStayFinite) {
     EXPECT_EQ(scoreOf(values), 13965384.0f);
 }
 
+// Only factors far out of proportion lead to such values; they are ranked as all others are.
+TEST(SVM, RanksValuesOfEveryMagnitude) {
+    std::vector<std::int32_t> wide = stairs(1900000000, 100000000);
+    std::reverse(wide.begin(), wide.end());
+    std::rotate(wide.begin(), wide.begin() + 11, wide.end());
+    EXPECT_EQ(scoreOf(wide), 163281904.0f);
+
+    // On both sides of plus and minus 2^25.
+    std::vector<std::int32_t> values{-33554433, 33554429, -33554431, 33554431, -33554429,
+                                     33554433,  33554430, -33554430, 33554432, -33554432};
+    for (std::int32_t i = 0; i < 28; ++i)
+        values.push_back(33000000 - i * 1000000);
+    EXPECT_EQ(scoreOf(values), 1961178.0f);
+}
+
+TEST(SVM, RanksNeighbouringValues) {
+    // Every step between two values is the least there is.
+    std::vector<std::int32_t> values = stairs(90, 1);
+    std::rotate(values.begin(), values.begin() + 23, values.end());
+    EXPECT_EQ(scoreOf(values), -8.47524261f);
+    std::swap(values[3], values[29]);
+    EXPECT_EQ(scoreOf(values), -8.47524261f);
+}
+
 TEST(SVM, GateComparesTheValueAsAFloat) {
     EXPECT_EQ(scoreOf({16777217}, 16777216.0f), 0.0f); // 2^24 + 1 rounds to 2^24, which is not greater
     EXPECT_NE(scoreOf({16777218}, 16777216.0f), 0.0f);

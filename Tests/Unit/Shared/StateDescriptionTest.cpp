@@ -178,9 +178,9 @@ TEST(StateDescription, VirtualPixelsShowValueAndTouch) {
 
 TEST(StateDescription, ALetterIsItsPixelsIndex) {
     Pixels pixels = makePixels();
-    pixels[0].index = 25;
+    pixels[0].index = 3;
     const std::string line = describeTouchState(HandStats(), pixels, Scripted::Electrodes{}, 0);
-    EXPECT_NE(line.find("[Z=   0    0, B="), std::string::npos) << line;
+    EXPECT_NE(line.find("[D=   0    0, B="), std::string::npos) << line;
 }
 
 } // namespace
