@@ -1,0 +1,182 @@
+#include "Host/Runtime/Files.h"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <csignal>
+#include <cstdlib>
+#include <memory>
+#include <optional>
+#include <utility>
+
+namespace ZorvaTouch::Host {
+namespace {
+
+/// Owns a file descriptor.
+class Descriptor {
+public:
+    explicit Descriptor(int number) noexcept : _number(number) {}
+    Descriptor(Descriptor &&other) noexcept : _number(std::exchange(other._number, -1)) {}
+    Descriptor(const Descriptor &) = delete;
+    Descriptor &operator=(const Descriptor &) = delete;
+    Descriptor &operator=(Descriptor &&) = delete;
+    ~Descriptor() {
+        if (_number >= 0)
+            ::close(_number);
+    }
+
+    [[nodiscard]] int number() const noexcept { return _number; }
+
+    /// Some file systems report a failed write only here.
+    void close() {
+        if (::close(std::exchange(_number, -1)) != 0 && errno != EINTR)
+            throw FileFailure("close", errno);
+    }
+
+private:
+    int _number;
+};
+
+/// Calls a system function again while signals interrupt it.
+template <typename Call> auto uninterrupted(const Call &call) {
+    auto result = call();
+    while (result < 0 && errno == EINTR)
+        result = call();
+    return result;
+}
+
+Descriptor openFile(const std::string &path, int flags) {
+    const int number = uninterrupted([&] { return ::open(path.c_str(), flags | O_CLOEXEC, 0666); });
+    if (number < 0)
+        throw FileFailure("open", errno);
+    return Descriptor(number);
+}
+
+/// What is at `path`, links followed; nothing if that cannot be told.
+std::optional<struct stat> statusOf(const std::string &path) {
+    struct stat status {};
+    return ::stat(path.c_str(), &status) == 0 ? std::optional(status) : std::nullopt;
+}
+
+/// Bytes to ask for so that a regular file is read in one go and its end is seen in the next.
+std::size_t firstReadSize(int descriptor) {
+    constexpr std::size_t kChunk = 64 * 1024;
+    struct stat status {};
+    if (::fstat(descriptor, &status) != 0 || !S_ISREG(status.st_mode) || status.st_size < 0)
+        return kChunk;
+    return std::max<std::size_t>(static_cast<std::size_t>(status.st_size) + 1, kChunk);
+}
+
+std::string readAll(int descriptor) {
+    std::string text(firstReadSize(descriptor), '\0');
+    std::size_t length = 0;
+    for (;;) {
+        if (length == text.size())
+            text.resize(text.size() * 2);
+        const auto count =
+            uninterrupted([&] { return ::read(descriptor, text.data() + length, text.size() - length); });
+        if (count < 0)
+            throw FileFailure("read", errno);
+        if (count == 0)
+            break;
+        length += static_cast<std::size_t>(count);
+    }
+    text.resize(length);
+    return text;
+}
+
+void writeAll(int descriptor, std::string_view text) {
+    while (!text.empty()) {
+        const auto count = uninterrupted([&] { return ::write(descriptor, text.data(), text.size()); });
+        if (count < 0)
+            throw FileFailure("write", errno);
+        text.remove_prefix(static_cast<std::size_t>(count));
+    }
+}
+
+/// The file that a link points at, so that renaming replaces that one; `path` itself if it does not exist.
+std::string resolveLinks(const std::string &path) {
+    const std::unique_ptr<char, decltype(&std::free)> resolved(::realpath(path.c_str(), nullptr), &std::free);
+    return resolved ? std::string(resolved.get()) : path;
+}
+
+std::string folderOf(const std::string &path) {
+    const auto slash = path.rfind('/');
+    return slash == std::string::npos ? "" : path.substr(0, slash + 1);
+}
+
+/// A new file that removes itself unless it is renamed.
+class TemporaryFile {
+public:
+    explicit TemporaryFile(const std::string &folder) : _descriptor(create(folder, _path)) {}
+    TemporaryFile(const TemporaryFile &) = delete;
+    TemporaryFile &operator=(const TemporaryFile &) = delete;
+    ~TemporaryFile() {
+        if (!_path.empty())
+            ::unlink(_path.c_str());
+    }
+
+    void write(std::string_view contents, std::optional<mode_t> permissions) {
+        writeAll(_descriptor.number(), contents);
+        if (permissions && ::fchmod(_descriptor.number(), *permissions) != 0)
+            throw FileFailure("change the permissions", errno);
+        if (::fsync(_descriptor.number()) != 0)
+            throw FileFailure("write", errno);
+        _descriptor.close();
+    }
+
+    void renameTo(const std::string &path) {
+        if (::rename(_path.c_str(), path.c_str()) != 0)
+            throw FileFailure("rename", errno);
+        _path.clear();
+    }
+
+private:
+    static Descriptor create(const std::string &folder, std::string &path) {
+        const std::string stem = folder + ".zorvatouch-" + std::to_string(::getpid()) + "-";
+        for (int attempt = 0;; ++attempt) {
+            path = stem + std::to_string(attempt);
+            try {
+                return openFile(path, O_WRONLY | O_CREAT | O_EXCL);
+            } catch (const FileFailure &failure) {
+                path.clear();
+                if (failure.code().value() != EEXIST || attempt == 100)
+                    throw FileFailure("open a temporary file beside it", failure.code().value());
+            }
+        }
+    }
+
+    std::string _path;
+    Descriptor _descriptor;
+};
+
+} // namespace
+
+std::string readFile(const std::string &path) { return readAll(openFile(path, O_RDONLY).number()); }
+
+std::string readStandardInput() { return readAll(static_cast<int>(StandardStream::Input)); }
+
+void replaceFile(const std::string &path, std::string_view contents) {
+    const std::optional<struct stat> old = statusOf(path);
+    if (old && !S_ISREG(old->st_mode)) {
+        Descriptor descriptor = openFile(path, O_WRONLY);
+        writeAll(descriptor.number(), contents);
+        descriptor.close();
+        return;
+    }
+    const std::string target = resolveLinks(path);
+    TemporaryFile file(folderOf(target));
+    file.write(contents, old ? std::optional<mode_t>(old->st_mode & 07777) : std::nullopt);
+    file.renameTo(target);
+}
+
+void writeStandard(StandardStream stream, std::string_view text) { writeAll(static_cast<int>(stream), text); }
+
+bool isTerminal(StandardStream stream) noexcept { return ::isatty(static_cast<int>(stream)) == 1; }
+
+void reportBrokenPipes() noexcept { std::signal(SIGPIPE, SIG_IGN); }
+
+} // namespace ZorvaTouch::Host

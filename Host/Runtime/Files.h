@@ -1,0 +1,48 @@
+#pragma once
+
+#include <string>
+#include <string_view>
+#include <system_error>
+
+/// Whole files in and out, and the standard streams. Failures are `std::system_error`: the code is the
+/// system's and the operation that failed is a verb, "open" or "write", kept with it.
+namespace ZorvaTouch::Host {
+
+/// An operation on a file and the reason why it failed.
+class FileFailure : public std::system_error {
+public:
+    FileFailure(const char *failedOperation, int errorNumber)
+        : std::system_error(errorNumber, std::generic_category(), failedOperation),
+          operation(failedOperation) {}
+    const char *operation; ///< a literal: "open", "read", "write", "rename"
+};
+
+/// Descriptors of the standard streams.
+enum class StandardStream : int { Input = 0, Output = 1, Error = 2 };
+
+/// Reads a whole file, or whatever else can be opened under that name.
+/// @throws FileFailure
+[[nodiscard]] std::string readFile(const std::string &path);
+
+/// Reads standard input up to its end.
+/// @throws FileFailure
+[[nodiscard]] std::string readStandardInput();
+
+/// Gives a file new contents: they are written to a temporary file in the same folder, flushed to the disk
+/// and renamed, so that under `path` there is always the whole old file or the whole new one. An existing
+/// file keeps its permissions, a symbolic link keeps pointing at it. What is no regular file (a pipe, a
+/// device) is written to as it is.
+/// @throws FileFailure  The temporary file is gone then.
+void replaceFile(const std::string &path, std::string_view contents);
+
+/// Writes everything.
+/// @throws FileFailure
+void writeStandard(StandardStream stream, std::string_view text);
+
+/// Whether a person watches: the stream is a terminal.
+[[nodiscard]] bool isTerminal(StandardStream stream) noexcept;
+
+/// Makes a write to a pipe that nobody reads fail with EPIPE instead of ending the process without a word.
+void reportBrokenPipes() noexcept;
+
+} // namespace ZorvaTouch::Host

@@ -1,0 +1,179 @@
+#include "Tests/Unit/Tools/Cli/CliFixture.h"
+
+#include <gmock/gmock.h>
+
+// How the command line answers to what it is given: help, usage errors, files that cannot be read.
+
+namespace ZorvaTouch::Tools {
+namespace {
+
+using Usage = CliFixture;
+using ::testing::EndsWith;
+using ::testing::HasSubstr;
+using ::testing::MatchesRegex;
+using ::testing::StartsWith;
+
+TEST_F(Usage, VersionIsOneLine) {
+    EXPECT_THAT(outputOf({"--version"}), MatchesRegex("zorvatouch [0-9]+\\.[0-9]+\\.[0-9]+\n"));
+}
+
+TEST_F(Usage, HelpNamesTheCommandsAndGivesExamples) {
+    const std::string help = outputOf({"--help"});
+    for (const char *command : {"replay", "info", "show", "convert", "trim", "make"})
+        EXPECT_THAT(help, HasSubstr(std::string("\n  ") + command + " ")) << command;
+    EXPECT_THAT(help, HasSubstr("Usage: zorvatouch [OPTIONS] [COMMAND]\n"));
+    EXPECT_THAT(help, HasSubstr("\nExamples:\n  zorvatouch replay touch.json\n"));
+    EXPECT_THAT(help, HasSubstr("\nExit status:\n  0  done\n"));
+    EXPECT_EQ(outputOf({"-h"}), help);
+}
+
+TEST_F(Usage, EveryCommandHasHelpWithExamples) {
+    for (const std::string command : {"replay", "info", "show", "convert", "trim", "make"}) {
+        const std::string help = outputOf({command, "--help"});
+        EXPECT_THAT(help, HasSubstr("Usage: zorvatouch " + command + " [OPTIONS] "));
+        EXPECT_THAT(help, HasSubstr("\nExamples:\n"));
+        EXPECT_THAT(help, HasSubstr("  zorvatouch " + command + " "));
+    }
+}
+
+TEST_F(Usage, ErrorsAreOneLineThatSaysWhereHelpIs) {
+    EXPECT_EQ(errorOf({}), "zorvatouch: a command is missing (see zorvatouch --help)\n");
+    EXPECT_EQ(errorOf({"play"}), "zorvatouch: 'play' is no command (see zorvatouch --help)\n");
+    EXPECT_EQ(errorOf({"play", "a.json"}), "zorvatouch: 'play' is no command (see zorvatouch --help)\n");
+    EXPECT_EQ(errorOf({"--loud"}),
+              "zorvatouch: The following argument was not expected: --loud (see zorvatouch --help)\n");
+}
+
+TEST_F(Usage, CommandsNeedTheirArguments) {
+    EXPECT_EQ(errorOf({"replay"}), "zorvatouch: FILE is required (see zorvatouch replay --help)\n");
+    EXPECT_EQ(errorOf({"info"}), "zorvatouch: FILE is required (see zorvatouch info --help)\n");
+    EXPECT_EQ(errorOf({"show", "--raw"}), "zorvatouch: FILE is required (see zorvatouch show --help)\n");
+    EXPECT_EQ(errorOf({"convert", "a"}), "zorvatouch: OUT is required (see zorvatouch convert --help)\n");
+    EXPECT_EQ(errorOf({"trim", "a", "b"}), "zorvatouch: --max is required (see zorvatouch trim --help)\n");
+    EXPECT_EQ(errorOf({"make", "a"}), "zorvatouch: OUT is required (see zorvatouch make --help)\n");
+}
+
+TEST_F(Usage, CommandsTakeNoOtherArguments) {
+    EXPECT_THAT(errorOf({"replay", "a", "--frame", "1"}), HasSubstr(" not expected: --frame "));
+    EXPECT_THAT(errorOf({"show", "a", "b"}), EndsWith(" not expected: b (see zorvatouch show --help)\n"));
+    EXPECT_THAT(errorOf({"make", "a", "b", "c"}),
+                EndsWith(" not expected: c (see zorvatouch make --help)\n"));
+}
+
+TEST_F(Usage, ValuesMustFit) {
+    const auto problem = [this](std::initializer_list<std::string> arguments) {
+        const std::string text = errorOf(arguments);
+        return text.substr(12, text.find(" (see ") - 12);
+    };
+    EXPECT_EQ(problem({"replay", "a", "--speed", "0"}), "--speed: '0' is no number above 0");
+    EXPECT_EQ(problem({"replay", "a", "--speed", "-1"}), "--speed: '-1' is no number above 0");
+    EXPECT_EQ(problem({"replay", "a", "--speed", "nan"}), "--speed: 'nan' is no number above 0");
+    EXPECT_EQ(problem({"replay", "a", "--speed", "2x"}), "--speed: '2x' is no number above 0");
+    EXPECT_EQ(problem({"replay", "a", "--speed", "1e99"}), "--speed: '1e99' is no number above 0");
+    EXPECT_EQ(problem({"replay", "a", "--log-level", "info"}),
+              "--log-level: 'info' is none of debug, default, error");
+    EXPECT_EQ(problem({"replay", "a", "--set", "ActivationThreshold"}),
+              "--set: 'ActivationThreshold' is not KEY=VALUE");
+    EXPECT_EQ(problem({"replay", "a", "--set", "Threshold=1"}),
+              "--set: 'Threshold' is no state key that can be written");
+    EXPECT_EQ(problem({"replay", "a", "--set", "=1"}), "--set: '' is no state key that can be written");
+    EXPECT_EQ(problem({"replay", "a", "--set", "EventStats=1"}),
+              "--set: 'EventStats' is no state key that can be written");
+    EXPECT_EQ(problem({"replay", "a", "--set", "Algs.Pipeline.ActivationThreshold=1"}),
+              "--set: 'Algs.Pipeline.ActivationThreshold' is no state key that can be written");
+    EXPECT_EQ(problem({"replay", "a", "--set", "VirtualNormalizationFactors.23=1"}),
+              "--set: 'VirtualNormalizationFactors.23' is no state key that can be written");
+    EXPECT_EQ(problem({"trim", "a", "b", "--max", "0"}), "--max: '0' is no whole number from 1 on");
+    EXPECT_EQ(problem({"trim", "a", "b", "--max", "0x10"}), "--max: '0x10' is no whole number from 1 on");
+    EXPECT_EQ(problem({"show", "a", "--frame", "-1"}), "--frame: '-1' is no whole number from 0 on");
+    EXPECT_EQ(problem({"show", "a", "--frame", "1.5"}), "--frame: '1.5' is no whole number from 0 on");
+    EXPECT_EQ(problem({"show", "a", "--frame", "18446744073709551616"}),
+              "--frame: '18446744073709551616' is no whole number from 0 on");
+    EXPECT_EQ(problem({"show", "a", "--frame", ""}), "--frame: '' is no whole number from 0 on");
+    EXPECT_THAT(problem({"replay", "a", "--speed"}), HasSubstr("--speed"));
+}
+
+TEST_F(Usage, StandardInputCanBeReadOnce) {
+    const std::string message = "standard input can be read only once";
+    EXPECT_THAT(errorOf({"replay", "-", "-"}), HasSubstr(message));
+    EXPECT_THAT(errorOf({"replay", "-", "--expect", "-"}), HasSubstr(message));
+    EXPECT_THAT(errorOf({"info", "-", "a", "-"}), HasSubstr(message));
+}
+
+TEST_F(Usage, FilesMayHaveAnyName) {
+    makeRecording("replay", "raw");
+    makeRecording("[a,b]", "raw");
+    makeRecording("-x", "raw");
+    std::filesystem::current_path(path(""));
+    EXPECT_THAT(outputOf({"info", "replay"}), StartsWith("replay\n"));
+    EXPECT_THAT(outputOf({"info", "[a,b]"}), StartsWith("./[a,b]\n"));
+    EXPECT_THAT(outputOf({"info", "--", "-x"}), StartsWith("-x\n"));
+    std::filesystem::current_path(std::filesystem::temp_directory_path());
+}
+
+// --- Files that cannot be read
+// -------------------------------------------------------------------------------------
+
+TEST_F(Usage, AFileThatIsNotThereIsAnError) {
+    for (const std::string command : {"replay", "info", "show"})
+        EXPECT_EQ(errorOf({command, "@a.json"}),
+                  "zorvatouch: @a.json: cannot open: No such file or directory\n");
+    EXPECT_EQ(errorOf({"replay", ""}), "zorvatouch: '': cannot open: No such file or directory\n");
+}
+
+TEST_F(Usage, AFolderIsNoFile) {
+    std::filesystem::create_directory(path("folder"));
+    EXPECT_EQ(errorOf({"replay", "@folder"}), "zorvatouch: @folder: cannot read: Is a directory\n");
+}
+
+TEST_F(Usage, TextThatIsNoJsonIsAnError) {
+    writeFile("a.json", "");
+    EXPECT_EQ(
+        errorOf({"replay", "@a.json"}),
+        "zorvatouch: @a.json: migrateSerializedContainer failed: invalid container (the text is empty)\n");
+    input = "[}";
+    EXPECT_THAT(
+        errorOf({"replay", "-"}),
+        StartsWith("zorvatouch: standard input: migrateSerializedContainer failed: invalid container ("));
+}
+
+TEST_F(Usage, JsonThatIsNoContainerIsAnError) {
+    const auto problem = [this](const std::string &text) {
+        writeFile("a.json", text);
+        const std::string line = errorOf({"info", "@a.json"});
+        EXPECT_THAT(line, StartsWith("zorvatouch: @a.json: "));
+        return line.substr(21, line.size() - 22);
+    };
+    EXPECT_EQ(problem("[]"), "migrateSerializedContainer failed: invalid container");
+    EXPECT_EQ(problem(R"({"Frames":[]})"), "migrateSerializedContainer failed: invalid version");
+    EXPECT_EQ(problem(R"({"Version":3})"), "migrateSerializedContainer failed: invalid container version: 3");
+    EXPECT_EQ(problem(R"({"Version":2})"), "invalid frames");
+    EXPECT_EQ(problem(R"({"Version":0,"Reports":[{"Timestamp":1}]})"),
+              "frame 0: migrateSerializedContainer failed: frame lacks ReportData");
+}
+
+TEST_F(Usage, AFrameThatIsWrongIsNamed) {
+    writeFile("a.json",
+              R"({"Version":2,"Frames":[{"Type":"InputReport","Timestamp":1,"Data":""},{"Type":"Image"}]})");
+    EXPECT_EQ(errorOf({"replay", "@a.json"}), "zorvatouch: @a.json: frame 1: invalid frame type\n");
+    writeFile("a.json", R"({"Version":2,"Frames":[{"Type":"InputReport","Timestamp":1,"Data":"100"}]})");
+    EXPECT_EQ(errorOf({"replay", "@a.json"}), "zorvatouch: @a.json: frame 0: invalid hex string\n");
+}
+
+TEST_F(Usage, WhatWasDoneBeforeAnErrorIsShown) {
+    makeRecording("a.json", "raw");
+    const Run result = run({"replay", "--json", "@a.json", "@b.json"});
+    EXPECT_EQ(result.status, 2);
+    EXPECT_THAT(result.output, StartsWith("{\"type\":\"unhandled\",\"n\":0}\n{\"type\":\"end\","));
+    EXPECT_THAT(result.error, EndsWith("b.json: cannot open: No such file or directory\n"));
+}
+
+TEST_F(Usage, AnErrorStaysInOneLineWhateverTheNameHolds) {
+    EXPECT_EQ(errorOf({"replay", "@a\nb\x1b[1m"}),
+              "zorvatouch: @a?b?[1m: cannot open: No such file or directory\n");
+    EXPECT_EQ(errorOf({"replay", "@a\xff"}),
+              "zorvatouch: @a\xEF\xBF\xBD: cannot open: No such file or directory\n");
+}
+
+} // namespace
+} // namespace ZorvaTouch::Tools

@@ -1,0 +1,311 @@
+#include "Tools/Cli/Options.h"
+
+#include "Tools/Cli/CliError.h"
+#include "Tools/Cli/Documents.h"
+#include "Tools/Cli/OptionValues.h"
+
+#include <CLI/CLI.hpp>
+
+#include <algorithm>
+#include <utility>
+
+namespace ZorvaTouch::Tools {
+namespace {
+
+constexpr const char *kProgram = "zorvatouch";
+
+constexpr const char *kMainFooter = R"(
+Files: "-" is standard input or output. Recordings are JSON containers.
+
+Examples:
+  zorvatouch replay touch.json
+  zorvatouch make hold.txt - | zorvatouch replay -
+  zorvatouch COMMAND --help
+
+Exit status:
+  0  done
+  1  a check that was asked for failed
+  2  bad usage, or a file that cannot be read or written
+)";
+
+constexpr const char *kReplayFooter = R"(
+Examples:
+  zorvatouch replay monday.json tuesday.json
+  zorvatouch replay touch.json --set HoldTimeoutMilliseconds=700 --speed 1
+  zorvatouch replay touch.json --json > expected.jsonl
+  zorvatouch replay touch.json --expect expected.jsonl
+)";
+
+constexpr const char *kInfoFooter = R"(
+Examples:
+  zorvatouch info touch.json
+  zorvatouch info --json *.json
+)";
+
+constexpr const char *kShowFooter = R"(
+Examples:
+  zorvatouch show touch.json
+  zorvatouch show touch.json --frame 12 --raw
+)";
+
+constexpr const char *kConvertFooter = R"(
+Examples:
+  zorvatouch convert old.json new.json
+)";
+
+constexpr const char *kTrimFooter = R"(
+Examples:
+  zorvatouch trim long.json short.json --max 500
+)";
+
+constexpr const char *kMakeFooter = R"(
+Examples:
+  zorvatouch make tap.txt tap.json
+  printf 'touch A=300 for 120ms\nidle for 100ms\n' | zorvatouch make - - | zorvatouch replay -
+)";
+
+constexpr const char *kSynthFooter = R"(
+Examples:
+  zorvatouch synth --list
+  zorvatouch synth --scenario slides --seed 7 --duration 10 -o slides.json
+  zorvatouch synth --scenario taps --noise 8 -o - | zorvatouch replay -
+)";
+
+/// Declares one command: its options are kept as text and read by `read` once they are all there.
+class CommandLine {
+public:
+    CommandLine() : _app("Replays and inspects recordings of the touch sensor.", kProgram) {
+        _app.set_version_flag("--version", std::string(kProgram) + " " + ZORVA_VERSION,
+                              "Say the version and exit");
+        describeHelp(_app);
+        describeFormat();
+        _app.footer(kMainFooter);
+        _app.require_subcommand(0, 1); // so that a file may have a command's name
+        declareReplay();
+        declareInfo();
+        declareShow();
+        declareConvert();
+        declareTrim();
+        declareMake();
+        declareSynth();
+    }
+
+    [[nodiscard]] Options parse(std::span<const std::string> arguments) {
+        try {
+            _app.parse(libraryArguments(arguments));
+        } catch (const CLI::CallForHelp &) {
+            return AnswerOptions{helpText()};
+        } catch (const CLI::CallForVersion &) {
+            return AnswerOptions{_app.version() + "\n"};
+        } catch (const CLI::ParseError &error) {
+            throw CliError(parseProblem(error) + hint());
+        }
+        return readOptions();
+    }
+
+private:
+    /// In the order the library wants, from last to first. It takes "[a,b]" for two arguments, but as a
+    /// file's name it is one.
+    static std::vector<std::string> libraryArguments(std::span<const std::string> arguments) {
+        std::vector<std::string> reversed(arguments.rbegin(), arguments.rend());
+        for (std::string &argument : reversed)
+            if (argument.starts_with('[') && argument.ends_with(']'))
+                argument.insert(0, "./");
+        return reversed;
+    }
+
+    void describeFormat() {
+        const auto formatter = _app.get_formatter(); // the commands' too
+        formatter->column_width(24);
+        formatter->label("SUBCOMMAND", "COMMAND");
+        formatter->label("Positionals", "Arguments");
+        formatter->label("REQUIRED", "");
+    }
+
+    static void describeHelp(CLI::App &app) { app.set_help_flag("-h,--help", "Say this and exit"); }
+
+    CLI::App &declare(const char *name, const char *description, const char *footer) {
+        CLI::App &command = *_app.add_subcommand(name, description);
+        describeHelp(command);
+        command.group("Commands");
+        command.footer(footer);
+        return command;
+    }
+
+    static void addFiles(CLI::App &command, std::vector<std::string> &files) {
+        command.add_option("FILE", files, "Recordings")->required()->type_name("");
+    }
+
+    static void addInAndOut(CLI::App &command, std::string &in, std::string &out, const char *inDescription) {
+        command.add_option("IN", in, inDescription)->required()->type_name("");
+        command.add_option("OUT", out, "Recording to write")->required()->type_name("");
+    }
+
+    void declareReplay() {
+        CLI::App &command =
+            declare("replay", "Play recordings and say which gestures come out", kReplayFooter);
+        addFiles(command, _replay.files);
+        command.add_option("--speed", _speed, "Pace: 1 is as recorded; no pauses unless given")
+            ->type_name("X");
+        command.add_option("--set", _settings, "Begin with a state, as --set ActivationThreshold=250")
+            ->type_name("KEY=VALUE")
+            ->allow_extra_args(false);
+        command.add_flag("--describe", _replay.describe,
+                         "Add the recognizer's view of each frame with a gesture");
+        command.add_flag("--json", _replay.json, "Write a line of JSON for each report");
+        command.add_option("--expect", _replay.expectFile, "Compare with what --json has written before")
+            ->type_name("FILE");
+        command
+            .add_option("--log-level", _logLevel,
+                        "Log to standard error: debug, default or error (as if not given)")
+            ->type_name("LEVEL");
+    }
+
+    void declareInfo() {
+        CLI::App &command = declare("info", "Say what recordings hold", kInfoFooter);
+        addFiles(command, _info.files);
+        command.add_flag("--json", _info.json, "Write a line of JSON for each recording");
+    }
+
+    void declareShow() {
+        CLI::App &command = declare("show", "Draw an image of the sensor", kShowFooter);
+        command.add_option("FILE", _show.file, "Recording")->required()->type_name("");
+        command.add_option("--frame", _frame, "Index in the recording; the strongest image unless given")
+            ->type_name("N");
+        command.add_flag("--raw", _show.raw, "Draw the raw counts instead of the signals");
+    }
+
+    void declareConvert() {
+        CLI::App &command =
+            declare("convert", "Write a recording of any version as the current one", kConvertFooter);
+        addInAndOut(command, _convert.in, _convert.out, "Recording to read");
+    }
+
+    void declareTrim() {
+        CLI::App &command = declare("trim", "Keep the newest frames and the states they need", kTrimFooter);
+        addInAndOut(command, _trim.in, _trim.out, "Recording to read");
+        command.add_option("--max", _max, "Frames to keep, state writes not counted")
+            ->required()
+            ->type_name("N");
+    }
+
+    void declareMake() {
+        CLI::App &command = declare("make", "Make a recording from its text form", kMakeFooter);
+        addInAndOut(command, _make.in, _make.out, "Text to read");
+    }
+
+    void declareSynth() {
+        _synth.declare(declare("synth", "Make a labelled recording without a device", kSynthFooter));
+    }
+
+    /// The command that was named, or the program if none was.
+    [[nodiscard]] CLI::App &chosenApp() {
+        const auto chosen = _app.get_subcommands();
+        return chosen.empty() ? _app : *chosen.front();
+    }
+
+    [[nodiscard]] std::string helpText() {
+        return &chosenApp() == &_app ? _app.help() : chosenApp().help(kProgram);
+    }
+
+    [[nodiscard]] std::string hint() {
+        std::string text(" (see ");
+        text.append(kProgram);
+        if (&chosenApp() != &_app)
+            text.append(" ").append(chosenApp().get_name());
+        return text.append(" --help)");
+    }
+
+    /// What the library found wrong, in one line.
+    [[nodiscard]] std::string parseProblem(const CLI::ParseError &error) {
+        const auto extras = _app.remaining();
+        if (&chosenApp() == &_app && !extras.empty() && !extras.front().starts_with('-'))
+            return "'" + extras.front() + "' is no command";
+        std::string text = error.what();
+        std::replace(text.begin(), text.end(), '\n', ' ');
+        return text;
+    }
+
+    [[nodiscard]] Options readOptions() {
+        try {
+            return readChosen(chosenApp().get_name());
+        } catch (const CliError &error) {
+            throw CliError(error.what() + hint());
+        }
+    }
+
+    [[nodiscard]] Options readChosen(const std::string &command) {
+        if (command == "replay")
+            return readReplay();
+        if (command == "info")
+            return readInfo();
+        if (command == "show")
+            return readShow();
+        if (command == "convert")
+            return _convert;
+        if (command == "trim")
+            return readTrim();
+        if (command == "make")
+            return _make;
+        if (command == "synth")
+            return _synth.read();
+        throw CliError("a command is missing");
+    }
+
+    static void requireOneStandardInput(std::vector<std::string> inputs) {
+        if (std::count(inputs.begin(), inputs.end(), kStandardStreamName) > 1)
+            throw CliError("standard input can be read only once");
+    }
+
+    [[nodiscard]] ReplayOptions readReplay() {
+        if (_speed)
+            _replay.speed = parseSpeed(*_speed);
+        for (const std::string &setting : _settings)
+            _replay.settings.push_back(parseSetting(setting));
+        if (_logLevel)
+            _replay.logLevel = parseLogLevel(*_logLevel);
+        std::vector<std::string> inputs = _replay.files;
+        if (_replay.expectFile) {
+            if (_replay.files.size() != 1)
+                throw CliError("--expect takes exactly one recording");
+            inputs.push_back(*_replay.expectFile);
+        }
+        requireOneStandardInput(inputs);
+        return _replay;
+    }
+
+    [[nodiscard]] InfoOptions readInfo() {
+        requireOneStandardInput(_info.files);
+        return _info;
+    }
+
+    [[nodiscard]] ShowOptions readShow() {
+        if (_frame)
+            _show.frame = parseCount("--frame", *_frame, 0);
+        return _show;
+    }
+
+    [[nodiscard]] TrimOptions readTrim() {
+        _trim.max = parseCount("--max", _max, 1);
+        return _trim;
+    }
+
+    CLI::App _app;
+    ReplayOptions _replay;
+    InfoOptions _info;
+    ShowOptions _show;
+    ConvertOptions _convert;
+    TrimOptions _trim;
+    MakeOptions _make;
+    SynthArguments _synth;
+    // As typed.
+    std::optional<std::string> _speed, _logLevel, _frame;
+    std::vector<std::string> _settings;
+    std::string _max;
+};
+
+} // namespace
+
+Options parseOptions(std::span<const std::string> arguments) { return CommandLine().parse(arguments); }
+
+} // namespace ZorvaTouch::Tools

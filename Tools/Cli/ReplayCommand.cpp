@@ -1,0 +1,66 @@
+#include "Tools/Cli/ReplayCommand.h"
+
+#include "Tools/Cli/Documents.h"
+#include "Tools/Cli/Progress.h"
+#include "Tools/Cli/ReplayExpecter.h"
+#include "Tools/Cli/ReplayJson.h"
+#include "Tools/Cli/ReplayTable.h"
+
+#include <cmath>
+#include <memory>
+
+namespace ZorvaTouch::Tools {
+namespace {
+
+std::unique_ptr<ReplayPrinter> makePrinter(const ReplayOptions &options, Environment &environment) {
+    if (options.json)
+        return std::make_unique<ReplayJson>(environment.output, options.describe);
+    return std::make_unique<ReplayTable>(environment, options.describe);
+}
+
+std::unique_ptr<Replay> openReplay(const std::string &file, const ReplayOptions &options,
+                                   Environment &environment, Ports::LogProvider &logs) {
+    auto replay = std::make_unique<Replay>(readRecording(file, environment).frames, environment.clock, logs);
+    for (const Setting &setting : options.settings)
+        replay->setState(setting.key, setting.value);
+    return replay;
+}
+
+void play(Replay &replay, const std::string &title, const ReplayOptions &options, Environment &environment,
+          ReplayPrinter &printer) {
+    const bool isWatched = std::isfinite(options.speed); // then each gesture is shown as it happens
+    Progress progress(environment, title, replay.frames().size());
+    printer.begin(title, replay);
+    while (replay.next(options.speed)) {
+        printer.print(replay);
+        if (isWatched)
+            environment.output.flush();
+        progress.update(replay.frame().index + 1);
+    }
+    printer.end(replay);
+}
+
+ExitStatus runExpect(const ReplayOptions &options, Environment &environment, Ports::LogProvider &logs) {
+    const std::string expected = readDocument(*options.expectFile, environment);
+    const auto replay = openReplay(options.files.front(), options, environment, logs);
+    ReplayExpecter expecter(expected, inputTitle(*options.expectFile), options.describe, environment.output);
+    play(*replay, inputTitle(options.files.front()), options, environment, expecter);
+    expecter.finish();
+    return expecter.differs() ? kExitCheckFailed : kExitDone;
+}
+
+} // namespace
+
+ExitStatus runReplay(const ReplayOptions &options, Environment &environment) {
+    const auto logs = environment.openLogs(options.logLevel);
+    if (options.expectFile)
+        return runExpect(options, environment, *logs);
+    const auto printer = makePrinter(options, environment);
+    for (const std::string &file : options.files)
+        play(*openReplay(file, options, environment, *logs), inputTitle(file), options, environment,
+             *printer);
+    printer->finish();
+    return kExitDone;
+}
+
+} // namespace ZorvaTouch::Tools

@@ -1,0 +1,88 @@
+#include "Tools/Stimulus/StimulusTimeline.h"
+
+#include "Shared/Util/Bytes.h"
+#include "Tools/Stimulus/LineWords.h"
+#include "Tools/Stimulus/StimulusText.h"
+
+#include <utility>
+
+namespace ZorvaTouch::Tools {
+namespace {
+
+constexpr std::uint64_t kNanosecondsPerMs = 1'000'000;
+
+// Places in an image report, in bytes.
+constexpr std::size_t kFrameNumberAt = 1;
+constexpr std::size_t kTimeAt = 5;
+constexpr std::size_t kRawCountsAt = 13;
+constexpr std::size_t kSignalsAt = 43;
+
+using ImageReport = std::array<std::uint8_t, InputReport::Image::kReportLength>;
+
+void storeSignals(ImageReport &report, const Ramps &ramps, std::size_t index, std::size_t count) {
+    for (std::size_t i = 0; i < kElectrodeCount; ++i)
+        Util::storeLittle16(&report[kSignalsAt + 2 * i],
+                            static_cast<std::uint16_t>(ramps[i].at(index, count)));
+}
+
+} // namespace
+
+std::int16_t Ramp::at(std::size_t index, std::size_t count) const noexcept {
+    if (count < 2)
+        return from;
+    const auto rise = static_cast<std::int64_t>(to) - from;
+    const std::int64_t part = rise * static_cast<std::int64_t>(index) / static_cast<std::int64_t>(count - 1);
+    return static_cast<std::int16_t>(from + part);
+}
+
+void StimulusTimeline::addImages(const Ramps &ramps, std::size_t count) {
+    requireRoom(count);
+    requireTime(count * _periodMs); // at most 10^6 reports of 10^6 ms
+    ImageReport report{};
+    report[0] = InputReport::Image::kReportId;
+    for (std::size_t i = 0; i < kElectrodeCount; ++i)
+        Util::storeLittle16(&report[kRawCountsAt + 2 * i], _rawCounts[i]);
+    for (std::size_t index = 0; index < count; ++index) {
+        Util::storeLittle32(&report[kFrameNumberAt], _frameNumber++);
+        Util::storeLittle32(&report[kTimeAt], _sensorTimeMs);
+        storeSignals(report, ramps, index, count);
+        _frames.appendReport(timestampNs(), report);
+        advance(_periodMs);
+    }
+}
+
+void StimulusTimeline::wait(std::uint64_t durationMs) {
+    requireTime(durationMs);
+    advance(durationMs);
+}
+
+void StimulusTimeline::addReport(std::span<const std::uint8_t> report) {
+    requireRoom(1);
+    _frames.appendReport(timestampNs(), report);
+}
+
+void StimulusTimeline::addKeyed(FrameType type, std::string key, PropertyValue value) {
+    requireRoom(1);
+    _frames.append({type, timestampNs(), std::move(key), std::move(value), {}});
+}
+
+void StimulusTimeline::requireRoom(std::size_t frameCount) const {
+    if (frameCount > kStimulusMaxFrames - _frames.size())
+        throw LineProblem("the recording gets more than " + std::to_string(kStimulusMaxFrames) + " frames");
+}
+
+void StimulusTimeline::requireTime(std::uint64_t durationMs) const {
+    if (durationMs > kStimulusMaxDurationMs - _elapsedMs)
+        throw LineProblem("the recording gets longer than " + std::to_string(kStimulusMaxDurationMs) + "ms");
+}
+
+void StimulusTimeline::advance(std::uint64_t durationMs) noexcept {
+    _elapsedMs += durationMs;
+    _sensorTimeMs += static_cast<std::uint32_t>(durationMs); // modulo 2^32, like the sensor's clock
+}
+
+std::uint64_t StimulusTimeline::timestampNs() const noexcept {
+    return kStimulusStartNs + _elapsedMs * kNanosecondsPerMs;
+}
+
+} // namespace ZorvaTouch::Tools
