@@ -1,5 +1,4 @@
 #include "Fuzz/Transcript.h"
-#include "Shared/Util/Bytes.h"
 
 #include <array>
 #include <bit>
@@ -50,13 +49,13 @@ PropertyValue makeValue(FuzzedDataProvider &input) {
 
 std::vector<std::uint8_t> makeImage(FuzzedDataProvider &input, std::uint32_t frameNumber,
                                     std::uint32_t timeMs) {
-    std::vector<std::uint8_t> report(InputReport::Image::kReportLength);
-    report[0] = InputReport::Image::kReportId;
-    Util::storeLittle32(&report[1], frameNumber);
-    Util::storeLittle32(&report[5], timeMs);
-    for (std::size_t i = 0; i < kElectrodeCount; ++i)
-        Util::storeLittle16(&report[43 + 2 * i], input.ConsumeIntegral<std::uint16_t>());
-    return report;
+    InputReport::Image image{};
+    image.frameNumber = frameNumber;
+    image.timeMs = timeMs;
+    for (std::int16_t &signal : image.signals)
+        signal = input.ConsumeIntegral<std::int16_t>();
+    const auto report = image.toReport();
+    return {report.begin(), report.end()};
 }
 
 } // namespace

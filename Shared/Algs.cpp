@@ -11,8 +11,6 @@ namespace ZorvaTouch {
 namespace {
 
 constexpr std::uint32_t kTransducerFinger = 2;
-constexpr std::uint32_t kEventMaskHold = 0x2;
-constexpr std::uint32_t kEventMaskTap = 0x20000;
 
 /// The region travels in the y coordinate; mask and phase tell the gestures apart.
 std::shared_ptr<HostEvent> createGestureEvent(std::uint32_t eventMask, std::uint16_t phase,

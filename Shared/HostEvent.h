@@ -26,6 +26,10 @@ enum HostEventPhase : std::uint16_t {
     kEventPhaseMayBegin = 128,
 };
 
+/// Event masks that tell the gestures apart; may-begin and cancel have none.
+inline constexpr std::uint32_t kEventMaskHold = 0x2;
+inline constexpr std::uint32_t kEventMaskTap = 0x20000;
+
 /// Code of the digitizer field that carries the number of the frame that produced the event.
 inline constexpr std::uint32_t kDigitizerFieldFrameNumber = 0xB001B;
 

@@ -36,6 +36,19 @@ std::optional<InputReport::Image> InputReport::Image::parse(const std::uint8_t *
     return image;
 }
 
+std::array<std::uint8_t, InputReport::Image::kReportLength> InputReport::Image::toReport() const noexcept {
+    std::array<std::uint8_t, kReportLength> report{};
+    report[0] = kReportId;
+    Util::storeLittle32(&report[kFrameNumberAt], frameNumber);
+    Util::storeLittle32(&report[kTimeMsAt], timeMs);
+    std::copy(flags.begin(), flags.end(), &report[kFlagsAt]);
+    for (std::size_t i = 0; i < kElectrodeCount; ++i) {
+        Util::storeLittle16(&report[kRawCountsAt + 2 * i], rawCounts[i]);
+        Util::storeLittle16(&report[kSignalsAt + 2 * i], static_cast<std::uint16_t>(signals[i]));
+    }
+    return report;
+}
+
 std::optional<InputReport::FirmwareEvent> InputReport::FirmwareEvent::parse(const std::uint8_t *data,
                                                                             std::size_t length) noexcept {
     if (!fits<FirmwareEvent>(data, length))

@@ -38,6 +38,9 @@ struct Image {
     /// Threads:  any; no shared state.
     /// Realtime: yes.
     [[nodiscard]] static std::optional<Image> parse(const std::uint8_t *data, std::size_t length) noexcept;
+
+    /// The report that parses to this record: for those who play the device.
+    [[nodiscard]] std::array<std::uint8_t, kReportLength> toReport() const noexcept;
 };
 static_assert(sizeof(Image) == 72, "wire format: image record");
 

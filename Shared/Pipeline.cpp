@@ -8,7 +8,6 @@
 namespace ZorvaTouch {
 namespace {
 
-constexpr std::string_view kAlgsDomain = "Algs";
 constexpr std::string_view kDebugInfoKey = "DebugInfo";
 constexpr std::uint16_t kVendorUsagePage = 0xFF60;
 constexpr std::uint16_t kVendorUsageDeviceReset = 2;

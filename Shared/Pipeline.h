@@ -10,8 +10,12 @@
 #include <cstdint>
 #include <functional>
 #include <string>
+#include <string_view>
 
 namespace ZorvaTouch {
+
+/// Domain of the recognizer's state keys: "Algs.ActivationThreshold".
+inline constexpr std::string_view kAlgsDomain = "Algs";
 
 /// Routes input reports into the recognizer and its events out, answers state keys, and lets an owner watch.
 ///

@@ -1,5 +1,4 @@
 #include "Shared/Pipeline.h"
-#include "Shared/Util/Bytes.h"
 #include "Shared/Util/Json.h"
 
 #include <array>
@@ -15,7 +14,6 @@ using namespace ZorvaTouch;
 
 namespace {
 
-constexpr std::size_t kSignalsAt = 43;
 constexpr std::uint32_t kFrameCount = 20000;
 
 class Noise {
@@ -30,14 +28,11 @@ private:
     std::uint64_t _state = 20;
 };
 
-using Report = std::array<std::uint8_t, InputReport::Image::kReportLength>;
-
 /// A blob of some strength and width around an electrode, over noise; now and then any bits at all.
-Report makeReport(Noise &noise, std::uint32_t frame, std::uint32_t timeMs) {
-    Report report{};
-    report[0] = InputReport::Image::kReportId;
-    Util::storeLittle32(&report[1], frame);
-    Util::storeLittle32(&report[5], timeMs);
+InputReport::Image makeImage(Noise &noise, std::uint32_t frame, std::uint32_t timeMs) {
+    InputReport::Image image{};
+    image.frameNumber = frame;
+    image.timeMs = timeMs;
     const bool isWild = noise.below(200) == 0;
     const bool isPressed = (frame / 37) % 3 != 0;
     const int strength = 80 + noise.below(60) + static_cast<int>(frame % 700);
@@ -49,9 +44,9 @@ Report makeReport(Noise &noise, std::uint32_t frame, std::uint32_t timeMs) {
         const int blob = isPressed ? strength - distance * width : 0;
         const int signal =
             isWild ? static_cast<int>(noise.bits()) : (blob > 0 ? blob : 0) + noise.below(15) - 7;
-        Util::storeLittle16(&report[kSignalsAt + 2 * i], static_cast<std::uint16_t>(signal));
+        image.signals[i] = static_cast<std::int16_t>(signal);
     }
-    return report;
+    return image;
 }
 
 /// What is tuned at which frame; most of the run has the defaults.
@@ -81,10 +76,10 @@ int main() {
     std::uint32_t timeMs = 0xFFFFF000u; // wraps on the way
     for (std::uint32_t frame = 0; frame < kFrameCount; ++frame) {
         tune(pipeline, frame);
-        const Report report = makeReport(noise, frame, timeMs);
+        const InputReport::Image image = makeImage(noise, frame, timeMs);
+        const auto report = image.toReport();
         timeMs += 8 + noise.bits() % 5;
         pipeline.handleInputReport(0, report.data(), report.size());
-        const InputReport::Image image = *InputReport::Image::parse(report.data(), report.size());
         print(pipeline.algs().touchStateDescription(image.signals, image.timeMs));
         print(pipeline.algs().virtualStateDescription(image.signals, image.timeMs));
         // The descriptions round to six decimals; the bits tell more.

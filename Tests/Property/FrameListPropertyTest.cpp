@@ -67,11 +67,11 @@ RC_GTEST_PROP(FrameListProperty, LongHistoriesAgreeWithThePlainList, ()) {
     std::vector<std::vector<Frame>> copiedFrames;
     const auto steps = *gen::resize(
         120, gen::container<std::vector<Step>>(gen::weightedElement<Step>({{5, Step::Append},
-                                                                          {6, Step::AppendMany},
-                                                                          {3, Step::Trim},
-                                                                          {1, Step::Sort},
-                                                                          {2, Step::Copy},
-                                                                          {1, Step::Reassign}})));
+                                                                           {6, Step::AppendMany},
+                                                                           {3, Step::Trim},
+                                                                           {1, Step::Sort},
+                                                                           {2, Step::Copy},
+                                                                           {1, Step::Reassign}})));
     const auto frames = *upTo(20, crowdedFrame());
     RC_PRE(!frames.empty());
     std::size_t next = 0;

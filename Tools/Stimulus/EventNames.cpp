@@ -16,10 +16,10 @@ struct GestureRow {
 /// In the order of `Gesture`, without the reset, which is an event of another type.
 constexpr std::array<GestureRow, kGestureCount - 1> kDigitizerGestures{{
     {Gesture::MayBegin, "may-begin", 0, kEventPhaseMayBegin},
-    {Gesture::HoldStart, "hold-start", 0x2, kEventPhaseBegan},
-    {Gesture::HoldChange, "hold-change", 0x2, kEventPhaseChanged},
-    {Gesture::HoldEnd, "hold-end", 0x2, kEventPhaseEnded},
-    {Gesture::Tap, "tap", 0x20000, kEventPhaseNone},
+    {Gesture::HoldStart, "hold-start", kEventMaskHold, kEventPhaseBegan},
+    {Gesture::HoldChange, "hold-change", kEventMaskHold, kEventPhaseChanged},
+    {Gesture::HoldEnd, "hold-end", kEventMaskHold, kEventPhaseEnded},
+    {Gesture::Tap, "tap", kEventMaskTap, kEventPhaseNone},
     {Gesture::Cancel, "cancel", 0, kEventPhaseCancelled},
 }};
 constexpr std::string_view kResetName = "reset";

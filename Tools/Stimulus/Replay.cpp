@@ -3,11 +3,7 @@
 #include <utility>
 
 namespace ZorvaTouch::Tools {
-namespace {
-
-constexpr const char *kRecognizerDomain = "Algs.";
-
-} // namespace
+namespace {} // namespace
 
 Replay::Replay(FrameList frames, Ports::Clock &clock, Ports::LogProvider &logs)
     : _pipeline(std::make_shared<Pipeline>(logs)), _recording(std::move(frames), clock),
@@ -18,7 +14,7 @@ Replay::Replay(FrameList frames, Ports::Clock &clock, Ports::LogProvider &logs)
 }
 
 void Replay::setState(const std::string &key, const PropertyValue &value) {
-    _pipeline->setState(0, kRecognizerDomain + key, value);
+    _pipeline->setState(0, std::string(kAlgsDomain) + "." + key, value);
 }
 
 bool Replay::next(float speed) {

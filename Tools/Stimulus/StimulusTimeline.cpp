@@ -1,6 +1,5 @@
 #include "Tools/Stimulus/StimulusTimeline.h"
 
-#include "Shared/Util/Bytes.h"
 #include "Tools/Stimulus/LineWords.h"
 #include "Tools/Stimulus/StimulusText.h"
 
@@ -10,20 +9,6 @@ namespace ZorvaTouch::Tools {
 namespace {
 
 constexpr std::uint64_t kNanosecondsPerMs = 1'000'000;
-
-// Places in an image report, in bytes.
-constexpr std::size_t kFrameNumberAt = 1;
-constexpr std::size_t kTimeAt = 5;
-constexpr std::size_t kRawCountsAt = 13;
-constexpr std::size_t kSignalsAt = 43;
-
-using ImageReport = std::array<std::uint8_t, InputReport::Image::kReportLength>;
-
-void storeSignals(ImageReport &report, const Ramps &ramps, std::size_t index, std::size_t count) {
-    for (std::size_t i = 0; i < kElectrodeCount; ++i)
-        Util::storeLittle16(&report[kSignalsAt + 2 * i],
-                            static_cast<std::uint16_t>(ramps[i].at(index, count)));
-}
 
 } // namespace
 
@@ -38,15 +23,14 @@ std::int16_t Ramp::at(std::size_t index, std::size_t count) const noexcept {
 void StimulusTimeline::addImages(const Ramps &ramps, std::size_t count) {
     requireRoom(count);
     requireTime(count * _periodMs); // at most 10^6 reports of 10^6 ms
-    ImageReport report{};
-    report[0] = InputReport::Image::kReportId;
-    for (std::size_t i = 0; i < kElectrodeCount; ++i)
-        Util::storeLittle16(&report[kRawCountsAt + 2 * i], _rawCounts[i]);
+    InputReport::Image image{};
+    image.rawCounts = _rawCounts;
     for (std::size_t index = 0; index < count; ++index) {
-        Util::storeLittle32(&report[kFrameNumberAt], _frameNumber++);
-        Util::storeLittle32(&report[kTimeAt], _sensorTimeMs);
-        storeSignals(report, ramps, index, count);
-        _frames.appendReport(timestampNs(), report);
+        image.frameNumber = _frameNumber++;
+        image.timeMs = _sensorTimeMs;
+        for (std::size_t i = 0; i < kElectrodeCount; ++i)
+            image.signals[i] = ramps[i].at(index, count);
+        _frames.appendReport(timestampNs(), image.toReport());
         advance(_periodMs);
     }
 }

@@ -173,6 +173,12 @@ TEST(InputReport, RecordsHaveTheSizesOfTheWire) {
     EXPECT_EQ(sizeof(FactoryResetHoldDuration), 4u);
 }
 
+TEST(Image, WritesTheReportThatItWasParsedFrom) {
+    const std::vector<std::uint8_t> report = countingReport(1, 73);
+    const auto written = Image::parse(report.data(), report.size())->toReport();
+    EXPECT_EQ(std::vector<std::uint8_t>(written.begin(), written.end()), report);
+}
+
 TEST(InputReport, ParsersPromiseNotToThrow) {
     EXPECT_TRUE(noexcept(Image::parse(nullptr, 0)));
     EXPECT_TRUE(noexcept(FirmwareEvent::parse(nullptr, 0)));
