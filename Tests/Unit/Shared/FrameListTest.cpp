@@ -255,6 +255,19 @@ TEST(FrameList, TrimWorksAtChunkBorders) {
     }
 }
 
+TEST(FrameList, ABoundedListOfMetadataGoesOnForEver) {
+    // Each of the few chunks in use is filled with shared frames more than a thousand times.
+    FrameList list;
+    for (std::uint64_t i = 0; i < 300000; ++i) {
+        list.append(metadataFrame(i, "m", i));
+        if (list.size() >= 128)
+            list.trim(64);
+    }
+    list.trim(2);
+    EXPECT_EQ(framesOf(list),
+              (std::vector<Frame>{metadataFrame(299998, "m", 299998u), metadataFrame(299999, "m", 299999u)}));
+}
+
 TEST(FrameList, StatesInDroppedChunksAreCarriedOver) {
     // The one write stands 300 reports before the stretch that is kept.
     FrameList list;

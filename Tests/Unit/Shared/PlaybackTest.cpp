@@ -115,6 +115,13 @@ TEST_F(Playback, PausesAreReckonedInSinglePrecision) {
     // 4000000999 becomes 4000001024, the next multiple of 256; a thousandth of it is 4000001.024. In double
     // precision it would be 4000000.999.
     EXPECT_EQ(pauses("R1@0 R2@4000000999", 1.0f), Times{4000001});
+    // Every step is rounded: 109027134111 becomes 109027131392, a multiple of 8192, and its thousandth a
+    // multiple of
+    // 8. Rounded only at the end it would be 109027136, not rounded at all 109027134.
+    EXPECT_EQ(pauses("R1@0 R2@109027134111", 1.0f), Times{109027128});
+    // 8191835550 becomes 8191835648, a third of that 2730611968, a thousandth of that 2730612.0. In any other
+    // order, and in double precision, 2730611 is left.
+    EXPECT_EQ(pauses("R1@0 R2@8191835550", 3.0f), Times{2730612});
 }
 
 TEST_F(Playback, AnEqualSpacingIsTakenBeforeItIsRounded) {

@@ -33,7 +33,7 @@ float scoreOf(const std::vector<std::int32_t> &values, float activationThreshold
 std::vector<std::int32_t> stairs(std::int32_t first, std::int32_t step) {
     std::vector<std::int32_t> values(38);
     for (std::size_t i = 0; i < values.size(); ++i)
-        values[i] = first - static_cast<std::int32_t>(i) * step;
+        values[i] = static_cast<std::int32_t>(first - static_cast<std::int64_t>(i) * step);
     return values;
 }
 
