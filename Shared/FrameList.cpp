@@ -180,8 +180,8 @@ FrameList &FrameList::operator=(FrameList &&other) noexcept {
     return *this;
 }
 
-FrameView FrameList::viewOf(const Chunk &chunk, std::size_t index) noexcept {
-    const Slot &slot = chunk.slots[index];
+FrameView FrameList::viewOf(const Chunk &chunk, std::size_t slotIndex) noexcept {
+    const Slot &slot = chunk.slots[slotIndex];
     if (slot.length != kNotInline)
         return {FrameType::InputReport, slot.timestampNs, {}, kNoValue, {slot.bytes.data(), slot.length}};
     const Frame &frame = *chunk.others[slot.other];

@@ -85,7 +85,7 @@ private:
         std::size_t firstIndex; ///< position of the chunk's first frame in the list
     };
 
-    [[nodiscard]] static FrameView viewOf(const Chunk &chunk, std::size_t slot) noexcept;
+    [[nodiscard]] static FrameView viewOf(const Chunk &chunk, std::size_t slotIndex) noexcept;
     [[nodiscard]] ChunkRef takeChunk();
     void giveBack(ChunkRef chunk);
     /// The chunk that the next frame goes into.
