@@ -36,7 +36,6 @@ constexpr std::array<TypeName, 3> kTypeNames{{{"State", FrameType::State},
 constexpr std::string_view kInputReportName = kTypeNames[1].name;
 
 // --- Writing
-// -------------------------------------------------------------------------------------------------------
 
 bool hasName(FrameType type) { return static_cast<std::size_t>(type) < kTypeNames.size(); }
 
@@ -65,7 +64,6 @@ void appendFrame(std::string &text, const FrameView &frame) {
 constexpr std::size_t kTypicalFrameLength = 300;
 
 // --- Reading the current version
-// -----------------------------------------------------------------------------------
 
 using Member = std::optional<Util::JsonValue>;
 
@@ -195,7 +193,6 @@ FrameList readFrames(const Member &frames) {
 }
 
 // --- Migration
-// -----------------------------------------------------------------------------------------------------
 
 /// A container's version if it is one that is known.
 std::optional<std::uint64_t> knownVersion(const PropertyValue &version) {
