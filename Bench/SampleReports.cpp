@@ -8,13 +8,14 @@
 namespace ZorvaTouch::Bench {
 namespace {
 
-constexpr std::size_t kReportPeriodMs = 10;
-constexpr std::size_t kSignalsAt = 43;
+constexpr std::size_t kSignalsAt = 43; // byte of a report
+constexpr int kNoise = 8;              // counts, either way
+constexpr std::uint64_t kFirstTimestampNs = 1'000'000'000;
 
 /// A small generator of its own: the standard distributions differ between libraries.
 class Noise {
 public:
-    /// Evenly from -amplitude to amplitude.
+    /// From -amplitude to amplitude.
     int next(int amplitude) {
         _state = _state * 6364136223846793005u + 1442695040888963407u;
         const auto bits = static_cast<int>(_state >> 40);
@@ -26,14 +27,30 @@ private:
 };
 
 bool isPressed(Stimulus stimulus, std::size_t frame) {
-    return stimulus == Stimulus::Touched || (stimulus == Stimulus::Taps && frame % 50 < 12);
+    switch (stimulus) {
+    case Stimulus::Idle:
+        return false;
+    case Stimulus::Resting:
+        return true;
+    case Stimulus::Touched:
+        return frame % 100 != 99;
+    case Stimulus::Taps:
+        return frame % 50 < 12;
+    }
+    return false;
 }
 
-/// Strength of a finger over one electrode: strongest at `centre`, which wanders along the electrodes.
-int fingerSignal(std::size_t electrode, std::size_t frame) {
-    const auto centre = static_cast<int>(frame / 40 % kElectrodeCount);
-    const int distance = std::abs(static_cast<int>(electrode) - centre);
+/// Signal of a finger on one electrode.
+int fingerSignal(Stimulus stimulus, std::size_t electrode, std::size_t frame) {
+    if (!isPressed(stimulus, frame))
+        return 0;
+    const std::size_t centre = stimulus == Stimulus::Resting ? 2 : frame / 40 % kElectrodeCount;
+    const int distance = std::abs(static_cast<int>(electrode) - static_cast<int>(centre));
     return std::max(0, 420 - 130 * distance);
+}
+
+std::uint64_t timestampOf(std::size_t frame) {
+    return kFirstTimestampNs + frame * kReportPeriodMs * 1'000'000;
 }
 
 } // namespace
@@ -47,18 +64,32 @@ std::vector<Report> makeReports(Stimulus stimulus, std::size_t count) {
         Util::storeLittle32(&report[1], static_cast<std::uint32_t>(frame));
         Util::storeLittle32(&report[5], static_cast<std::uint32_t>(frame * kReportPeriodMs));
         for (std::size_t i = 0; i < kElectrodeCount; ++i) {
-            const int signal = (isPressed(stimulus, frame) ? fingerSignal(i, frame) : 0) + noise.next(8);
+            const int signal = fingerSignal(stimulus, i, frame) + noise.next(kNoise);
             Util::storeLittle16(&report[kSignalsAt + 2 * i], static_cast<std::uint16_t>(signal));
         }
     }
     return reports;
 }
 
+std::vector<InputReport::Image> makeImages(Stimulus stimulus, std::size_t count) {
+    std::vector<InputReport::Image> images;
+    images.reserve(count);
+    for (const Report &report : makeReports(stimulus, count))
+        images.push_back(*InputReport::Image::parse(report.data(), report.size()));
+    return images;
+}
+
+FrameList makeReportRecording(Stimulus stimulus, std::size_t count) {
+    FrameList frames;
+    for (const Report &report : makeReports(stimulus, count))
+        frames.appendReport(timestampOf(frames.size()), report);
+    return frames;
+}
+
 FrameList makeRecording(std::size_t count) {
     FrameList frames;
-    std::uint64_t timestampNs = 1'000'000'000;
     for (const Report &report : makeReports(Stimulus::Taps, count)) {
-        timestampNs += kReportPeriodMs * 1'000'000;
+        const std::uint64_t timestampNs = timestampOf(frames.size());
         if (frames.size() % 500 == 499)
             frames.append({FrameType::State, timestampNs, "Algs.ActivationThreshold", 200.0, {}});
         else

@@ -16,7 +16,6 @@ inline constexpr const char *kAccelKey = "Accel";
 /// The accelerometer in the same housing: gravity, noise, and a bump into the sensor as each contact begins.
 class Accelerometer {
 public:
-    /// @param parameters  Borrowed, for the life of the accelerometer.
     Accelerometer(const Parameters &parameters, Random random) noexcept;
 
     /// The time of the next sample up to `time`, once; nothing if there is none, as when the rate is 0.
@@ -29,7 +28,7 @@ public:
 private:
     [[nodiscard]] float read(double acceleration) noexcept;
 
-    const Parameters &_parameters;
+    Parameters _parameters;
     Random _random;
     double _x, _y, _z; ///< gravity, g
     std::uint64_t _samples = 0;

@@ -9,8 +9,7 @@
 
 namespace ZorvaTouch::Synth {
 
-/// The device's own idea of its untouched electrodes: what its firmware takes from the raw counts to get
-/// signals.
+/// The device's own idea of its untouched electrodes: what its firmware takes from raw counts to get signals.
 ///
 /// After a reset the baseline is the mean of what is measured first, be it touched or not. Later an
 /// electrode's baseline follows it slowly while its signal is within the touch band, quickly below the band,
@@ -20,7 +19,6 @@ class Baseline {
 public:
     using Signals = std::array<std::int16_t, kElectrodeCount>;
 
-    /// @param parameters  Borrowed, for the life of the baseline.
     explicit Baseline(const Parameters &parameters) noexcept : _parameters(parameters) {}
 
     void reset() noexcept { _measurements = 0; }
@@ -34,7 +32,7 @@ private:
     /// Part of the signal that the baseline takes over.
     [[nodiscard]] double shareOf(double signal, double seconds) const noexcept;
 
-    const Parameters &_parameters;
+    Parameters _parameters;
     std::array<double, kElectrodeCount> _levels{};
     double _measurements = 0; ///< since the reset; stops growing when the mean is made
 };

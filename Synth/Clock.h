@@ -12,7 +12,6 @@ namespace ZorvaTouch::Synth {
 class Clock {
 public:
     /// @param startNs     Host time at which the stream begins.
-    /// @param parameters  Borrowed, for the life of the clock.
     Clock(std::uint64_t startNs, const Parameters &parameters, Random random) noexcept
         : _parameters(parameters), _random(random), _startNs(startNs) {}
 
@@ -40,7 +39,7 @@ public:
     [[nodiscard]] std::uint64_t reportHostNs(Microseconds time) noexcept;
 
 private:
-    const Parameters &_parameters;
+    Parameters _parameters;
     Random _random;
     std::uint64_t _startNs;
     std::uint64_t _lastHostNs = 0;

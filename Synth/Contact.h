@@ -46,8 +46,8 @@ struct Blob {
     double width;  ///< mm, full width at half maximum
     double height; ///< of the signal at full pressure
 
-    /// The part of the height at some place: (1 - q)^3, where q = 1 is 1.1 widths from the centre, and 0
-    /// beyond.
+    /// What is left of the height at some place: (1 - q)^3 of it, where q = 1 is 1.1 widths from the centre;
+    /// nothing beyond.
     [[nodiscard]] double at(Point place) const noexcept;
 };
 

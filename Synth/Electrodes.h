@@ -8,8 +8,7 @@
 
 namespace ZorvaTouch::Synth {
 
-/// A place on the sensor as the finger sees it: millimetres from the upper left corner, x to the right, y
-/// down.
+/// A place on the sensor as the finger sees it: mm from the upper left corner, x to the right, y down.
 struct Point {
     double x = 0, y = 0;
 };

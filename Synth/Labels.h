@@ -12,8 +12,7 @@ namespace ZorvaTouch::Synth {
 
 inline constexpr const char *kLabelKey = "Label";
 
-/// The labels of a contact that is over: its own, and one of kind "Slide" for each time it moved to another
-/// region.
+/// The labels of a contact that is over: its own, and a "Slide" for each time it moved to another region.
 ///
 /// "Region" is a `PixelRegion` code; 0 marks what happens by accident and should give no gesture. All times
 /// are of the sensor's clock since the last reset; what came before it is left out.

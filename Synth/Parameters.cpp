@@ -13,7 +13,7 @@ constexpr std::array<ParameterInfo, kParameterCount> kParameters{{
     {"host-latency", "ms", 1, 0, 1000, "From measurement to host time stamp", &P::hostLatency},
     {"host-jitter", "ms", 0.3, 0, 1000, "Of reports beyond the latency, evenly from 0 to this",
      &P::hostJitter},
-    {"drop-rate", "%", 0, 0, 100, "Images that the host never gets", &P::dropRate},
+    {"drop-rate", "%", 0, 0, 90, "Images that the host never gets", &P::dropRate},
     {"repeat-rate", "%", 0, 0, 100, "Images that the host gets twice", &P::repeatRate},
     {"boot-time", "ms", 60, 0, 10000, "Silence after a reset of the device", &P::bootTime},
     {"signal", "counts", 800, 0, 20000, "Under the middle of a blob at full pressure, electrode with gain 1",

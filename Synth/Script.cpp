@@ -17,7 +17,7 @@ bool fits(Microseconds start, Microseconds length, Microseconds end) noexcept {
 } // namespace
 
 Script::Script(const Scenario &scenario, const Parameters &parameters, Random random, Microseconds end)
-    : _scenario(scenario), _parameters(parameters), _random(random), _end(end), _nextStart(kLeadIn) {
+    : _make(scenario.make), _parameters(parameters), _random(random), _end(end), _nextStart(kLeadIn) {
     thinkOfNext();
 }
 
@@ -39,7 +39,7 @@ std::optional<Microseconds> Script::takeReset(Microseconds time) noexcept {
 
 void Script::thinkOfNext() {
     for (int tries = 0; tries < kTries; ++tries) {
-        _next = _scenario.make(_random, _parameters);
+        _next = _make(_random, _parameters);
         if (fits(_nextStart, _next.contactsEnd(), _end))
             return;
     }

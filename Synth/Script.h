@@ -17,9 +17,7 @@ class Script {
 public:
     static constexpr Microseconds kForEver = std::numeric_limits<Microseconds>::max();
 
-    /// @param parameters  Borrowed, for the life of the script.
-    /// @param end         No contact lasts beyond this: of the last episodes only those that are short enough
-    /// begin.
+    /// @param end  No contact lasts beyond this: of the last episodes only those that are short enough begin.
     Script(const Scenario &scenario, const Parameters &parameters, Random random, Microseconds end);
 
     /// Begins the episodes that begin up to `time`, in order.
@@ -34,8 +32,8 @@ private:
     void thinkOfNext();
     void begin(const Episode &episode, Microseconds start);
 
-    const Scenario &_scenario;
-    const Parameters &_parameters;
+    EpisodeMaker _make;
+    Parameters _parameters;
     Random _random;
     Microseconds _end;
     Microseconds _nextStart; ///< of `_next`; `kForEver` when nothing comes any more

@@ -28,7 +28,6 @@ class SensorModel {
 public:
     using RawCounts = std::array<std::uint16_t, kElectrodeCount>;
 
-    /// @param parameters  Borrowed, for the life of the sensor.
     SensorModel(const Parameters &parameters, Random random) noexcept;
 
     /// Measures all electrodes once.
@@ -46,7 +45,7 @@ private:
 
     void drift(Electrode &electrode, double coverage, double seconds) noexcept;
 
-    const Parameters &_parameters;
+    Parameters _parameters;
     Random _noise;
     std::array<Electrode, kElectrodeCount> _electrodes;
 };

@@ -18,7 +18,8 @@ namespace ZorvaTouch::Synth {
 
 /// A device that nobody built, with somebody touching it: its reports, and what really happened, for ever.
 ///
-///     Stream stream(*scenarioNamed("taps"), Parameters(), 1);
+///     const Scenario &taps = *scenarioNamed("taps");
+///     Stream stream(taps, parametersOf(taps), 1);
 ///     for (;;)
 ///         use(stream.next());
 ///
@@ -29,16 +30,12 @@ class Stream {
 public:
     static constexpr std::uint64_t kStartNs = 1'000'000'000;
 
-    /// @param scenario    Borrowed, for the life of the stream; `parametersOf` it is what it is meant to
-    /// have.
-    /// @param parameters  Copied.
-    /// @param end         Nothing touches the sensor after this time, and nothing begins that would last
-    /// longer.
+    /// @param scenario    Who touches. Borrowed for the call.
+    /// @param parameters  `parametersOf` the scenario, or what was made of them.
+    /// @param end         No contact lasts beyond this.
     /// @param startNs     Host time of the beginning.
     Stream(const Scenario &scenario, const Parameters &parameters, std::uint64_t seed,
            Microseconds end = Script::kForEver, std::uint64_t startNs = kStartNs);
-    Stream(const Stream &) = delete; // the parts point at the parameters
-    Stream &operator=(const Stream &) = delete;
 
     /// The next frame in order of host time: an image report, a firmware event, or metadata: a label once its
     /// contact is over, an accelerometer sample.

@@ -1,6 +1,6 @@
-"""Fails unless every source of the core is compiled with exact arithmetic.
+"""Fails unless every source of these folders is compiled with exact arithmetic.
 
-Usage: check_flags.py COMPILE_COMMANDS_JSON CORE_FOLDER
+Usage: check_flags.py COMPILE_COMMANDS_JSON FOLDER...
 """
 
 import json
@@ -19,23 +19,24 @@ def faults(arguments):
         yield "inexact arithmetic: " + argument
 
 
-def main(commands_file, core_folder):
-    core = pathlib.Path(core_folder).resolve()
-    commands = [
-        command
-        for command in json.loads(pathlib.Path(commands_file).read_text())
-        if core in pathlib.Path(command["file"]).resolve().parents
-    ]
-    if not commands:
-        print(f"{commands_file}: no source of {core_folder} is compiled")
-        return 1
-    found = [
-        f"{command['file']}: {fault}"
-        for command in commands
-        for fault in faults(shlex.split(command["command"]))
-    ]
-    print("\n".join(found) or f"{len(commands)} sources: exact arithmetic")
-    return 1 if found else 0
+def commands_below(folder, commands):
+    folder = pathlib.Path(folder).resolve()
+    return [command for command in commands if folder in pathlib.Path(command["file"]).resolve().parents]
+
+
+def main(commands_file, *folders):
+    commands = json.loads(pathlib.Path(commands_file).read_text())
+    status = 0
+    for folder in folders:
+        below = commands_below(folder, commands)
+        found = [
+            f"{command['file']}: {fault}" for command in below for fault in faults(shlex.split(command["command"]))
+        ]
+        if not below:
+            found = ["no source of it is compiled"]
+        print(f"{folder}: " + ("\n".join(found) or f"{len(below)} sources, exact arithmetic"))
+        status |= bool(found)
+    return status
 
 
 if __name__ == "__main__":

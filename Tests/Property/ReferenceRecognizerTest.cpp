@@ -1,5 +1,6 @@
 #include "Bench/Reference/RecognizerPair.h"
 
+#include "Synth/Stream.h"
 #include "Tests/Support/FramesGenerators.h"
 #include "Tests/Support/SensorSequence.h"
 #include "Tools/Stimulus/StimulusText.h"
@@ -119,6 +120,19 @@ TEST(ReferenceRecognizer, GivesTheSameTextsOnEveryGoldenCase) {
         ++caseCount;
     }
     EXPECT_GT(caseCount, 40u);
+}
+
+TEST(ReferenceRecognizer, GivesTheSameTextsOnEveryMadeUpHand) {
+    constexpr std::uint64_t kSeed = 11;
+    constexpr double kSeconds = 30;
+    for (const Synth::Scenario &scenario : Synth::scenarios()) {
+        RecognizerPair pair;
+        for (const FrameView &frame :
+             Synth::synthesize(scenario, Synth::parametersOf(scenario), kSeed, kSeconds))
+            pair.handleFrame(frame);
+        pair.compareStates();
+        EXPECT_EQ(pair.difference(), "") << scenario.name;
+    }
 }
 
 RC_GTEST_PROP(ReferenceRecognizer, GivesTheSameTextsOnAnyFramesAndWrites, ()) {

@@ -67,6 +67,8 @@ def golden_recordings(program, folder):
     for text in sorted(folder.glob("*.txt")):
         made = subprocess.run([program, "make", text, "-"], stdout=subprocess.PIPE, check=True)
         yield text.name, parse(made.stdout)
+    for file in sorted(folder.glob("Synth/*.json")):
+        yield file.name, parse(file.read_bytes())
 
 
 def data_recordings(folder):

@@ -19,7 +19,7 @@ TEST_F(Usage, VersionIsOneLine) {
 
 TEST_F(Usage, HelpNamesTheCommandsAndGivesExamples) {
     const std::string help = outputOf({"--help"});
-    for (const char *command : {"replay", "info", "show", "convert", "trim", "make"})
+    for (const char *command : {"replay", "info", "show", "convert", "trim", "make", "synth"})
         EXPECT_THAT(help, HasSubstr(std::string("\n  ") + command + " ")) << command;
     EXPECT_THAT(help, HasSubstr("Usage: zorvatouch [OPTIONS] [COMMAND]\n"));
     EXPECT_THAT(help, HasSubstr("\nExamples:\n  zorvatouch replay touch.json\n"));
@@ -28,9 +28,9 @@ TEST_F(Usage, HelpNamesTheCommandsAndGivesExamples) {
 }
 
 TEST_F(Usage, EveryCommandHasHelpWithExamples) {
-    for (const std::string command : {"replay", "info", "show", "convert", "trim", "make"}) {
+    for (const std::string command : {"replay", "info", "show", "convert", "trim", "make", "synth"}) {
         const std::string help = outputOf({command, "--help"});
-        EXPECT_THAT(help, HasSubstr("Usage: zorvatouch " + command + " [OPTIONS] "));
+        EXPECT_THAT(help, HasSubstr("Usage: zorvatouch " + command + " [OPTIONS]"));
         EXPECT_THAT(help, HasSubstr("\nExamples:\n"));
         EXPECT_THAT(help, HasSubstr("  zorvatouch " + command + " "));
     }
