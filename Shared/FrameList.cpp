@@ -310,8 +310,8 @@ void FrameList::appendCopy(const Chunk &chunk, std::size_t slot) {
 }
 
 void FrameList::limitSpares(std::uint64_t maxCount) noexcept {
-    // As many as the list needs to grow to twice the bound again, and no more: a division rounds down, the first and
-    // the last chunk may be partly filled, and the next trim cuts one into a spare.
+    // As many as the list needs to grow to twice the bound again, and no more: a division rounds down, the
+    // first and the last chunk may be partly filled, and the next trim cuts one into a spare.
     constexpr std::uint64_t kPartlyFilled = 4;
     const std::uint64_t needed = maxCount / (kFramesPerChunk / 2) + kPartlyFilled;
     const std::uint64_t wanted = needed > _entries.size() ? needed - _entries.size() : 0;
