@@ -65,10 +65,9 @@ void writeContainer(benchmark::State &state, BarTable &table) {
 
 void registerContainerBars(BarTable &table) {
     registerBar("bar/read", kRounds, [&table](benchmark::State &state) {
-        readContainer(
-            state, table,
-            {.name = "reading a container", .counterpartName = "RapidJSON SAX", .limit = 1.5, .stretch = 3.0},
-            RapidJsonChecks::Same);
+        readContainer(state, table,
+                      {.name = "reading a container", .counterpartName = "RapidJSON SAX", .limit = 1.5},
+                      RapidJsonChecks::Same);
     });
     registerBar("bar/read_unchecked", kRounds, [&table](benchmark::State &state) {
         readContainer(state, table,
