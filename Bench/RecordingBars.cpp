@@ -148,14 +148,14 @@ void memoryPerReport(benchmark::State &state, BarTable &table) {
                                        recording.handleInputReport(0, report.data(), report.size());
                                }) /
                                1e9);
-        report(
-            state, table,
-            {.name = "memory of a kept report",
-             .unit = "bytes",
-             .counterpartName = "a report's own",
-             .figure = static_cast<double>(counter.bytes()) / static_cast<double>(recording.frames().size()),
-             .counterpart = kReportBytes,
-             .limit = 1.6});
+        const auto bytes = static_cast<double>(counter.bytes()); // before the bar's own texts add to it
+        report(state, table,
+               {.name = "memory of a kept report",
+                .unit = "bytes",
+                .counterpartName = "a report's own",
+                .figure = bytes / static_cast<double>(recording.frames().size()),
+                .counterpart = kReportBytes,
+                .limit = 1.6});
     }
 }
 

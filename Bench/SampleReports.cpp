@@ -1,15 +1,12 @@
 #include "Bench/SampleReports.h"
 
-#include "Shared/Util/Bytes.h"
-
 #include <algorithm>
 #include <cstdlib>
 
 namespace ZorvaTouch::Bench {
 namespace {
 
-constexpr std::size_t kSignalsAt = 43; // byte of a report
-constexpr int kNoise = 8;              // counts, either way
+constexpr int kNoise = 8; // counts, either way
 constexpr std::uint64_t kFirstTimestampNs = 1'000'000'000;
 
 /// A small generator of its own: the standard distributions differ between libraries.
@@ -59,14 +56,13 @@ std::vector<Report> makeReports(Stimulus stimulus, std::size_t count) {
     Noise noise;
     std::vector<Report> reports(count);
     for (std::size_t frame = 0; frame < count; ++frame) {
-        Report &report = reports[frame];
-        report[0] = InputReport::Image::kReportId;
-        Util::storeLittle32(&report[1], static_cast<std::uint32_t>(frame));
-        Util::storeLittle32(&report[5], static_cast<std::uint32_t>(frame * kReportPeriodMs));
-        for (std::size_t i = 0; i < kElectrodeCount; ++i) {
-            const int signal = fingerSignal(stimulus, i, frame) + noise.next(kNoise);
-            Util::storeLittle16(&report[kSignalsAt + 2 * i], static_cast<std::uint16_t>(signal));
-        }
+        InputReport::Image image{};
+        image.frameNumber = static_cast<std::uint32_t>(frame);
+        image.timeMs = static_cast<std::uint32_t>(frame * kReportPeriodMs);
+        for (std::size_t i = 0; i < kElectrodeCount; ++i)
+            image.signals[i] =
+                static_cast<std::int16_t>(fingerSignal(stimulus, i, frame) + noise.next(kNoise));
+        reports[frame] = image.toReport();
     }
     return reports;
 }
