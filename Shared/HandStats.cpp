@@ -29,7 +29,7 @@ constexpr float kLargeDrop = 0.5f;
 constexpr float kGainAfterSmallDrop = 1.3f;
 constexpr float kGainAfterLargeDrop = 5.0f;
 
-// Tap rejection: offsets of the features and weights of the linear score, fitted on recorded taps and palms.
+// Tap rejection: offsets of the features and weights of the linear score.
 constexpr float kStrengthDurationOffset = 0.51f;
 constexpr float kTimeDurationOffset = 0.25f;
 constexpr float kTouchStrengthDurationOffset = 0.65f;

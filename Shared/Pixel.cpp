@@ -11,7 +11,7 @@ namespace {
 constexpr float kReleaseRatio =
     0.6f; ///< of the peak (release) or into the valley (entry); single precision throughout
 
-/// Gain of each electrode's channel, unitless; evens out the electrodes' areas. Index order A to O.
+/// Gain of each electrode's channel, unitless. Index order A to O.
 constexpr std::array<float, kElectrodeCount> kElectrodeGains{1.9219f, 1.8833f, 1.9281f, 1.8837f, 1.9163f,
                                                              1.8105f, 1.0081f, 1.0f,    1.4851f, 1.5033f,
                                                              2.4154f, 1.5378f, 1.5431f, 1.04f,   1.0493f};

@@ -8,11 +8,11 @@ namespace ZorvaTouch {
 namespace {
 
 struct Rank {
-    float mean, scale; ///< of the feature over the training data, scaled sensor counts
+    float mean, scale; ///< what the feature is standardized by, scaled sensor counts
     float weight;      ///< of the standardized feature, unitless
 };
 
-/// The trained model, strongest channel first.
+/// The model, strongest channel first.
 constexpr std::array<Rank, kChannelCount> kModel{{
     {559.2485f, 319.631f, 2.0791f},   {458.1396f, 264.2479f, 0.577f},   {409.6764f, 238.355f, -0.0003f},
     {376.5288f, 222.3886f, 1.7971f},  {339.7854f, 211.1872f, 0.8896f},  {302.5308f, 206.0873f, -0.194f},
