@@ -3,6 +3,7 @@
 #include "Shared/Util/Numeric.h"
 #include "Shared/Util/Text.h"
 
+#include <cmath>
 #include <utility>
 
 namespace ZorvaTouch {
@@ -28,6 +29,31 @@ std::string digitizerText(const HostEvent &event) {
     return text;
 }
 
+std::string vendorDefinedText(const VendorDefinedFields &fields) {
+    std::string text;
+    appendMember(text, "{\"vendor\":true,\"usagePage\":", fields.usagePage);
+    appendMember(text, ",\"usage\":", fields.usage);
+    text.push_back('}');
+    return text;
+}
+
+void appendNumber(std::string &text, const char *name, float value) {
+    text.append(name);
+    if (std::isfinite(value))
+        Util::appendShortest(text, static_cast<double>(value));
+    else
+        text.append("null");
+}
+
+std::string accelerometerText(const AccelerometerFields &fields) {
+    std::string text;
+    appendNumber(text, "{\"accelerometer\":true,\"x\":", fields.x);
+    appendNumber(text, ",\"y\":", fields.y);
+    appendNumber(text, ",\"z\":", fields.z);
+    text.push_back('}');
+    return text;
+}
+
 } // namespace
 
 std::shared_ptr<HostEvent> HostEvent::createDigitizer(std::uint64_t timestamp, const DigitizerFields &fields,
@@ -40,12 +66,19 @@ std::shared_ptr<HostEvent> HostEvent::createVendorDefined(std::uint64_t timestam
     return std::make_shared<HostEvent>(timestamp, std::move(fields), options);
 }
 
-HostEvent::HostEvent(std::uint64_t timestamp, std::variant<DigitizerFields, VendorDefinedFields> fields,
-                     std::uint32_t options)
+std::shared_ptr<HostEvent> HostEvent::createAccelerometer(std::uint64_t timestamp,
+                                                          const AccelerometerFields &fields,
+                                                          std::uint32_t options) {
+    return std::make_shared<HostEvent>(timestamp, fields, options);
+}
+
+HostEvent::HostEvent(std::uint64_t timestamp, HostEventFields fields, std::uint32_t options)
     : _timestamp(timestamp), _fields(std::move(fields)), _options(options) {}
 
 HostEventType HostEvent::type() const noexcept {
-    return digitizer() ? HostEventType::Digitizer : HostEventType::VendorDefined;
+    if (digitizer())
+        return HostEventType::Digitizer;
+    return vendorDefined() ? HostEventType::VendorDefined : HostEventType::Accelerometer;
 }
 
 std::optional<std::int64_t> HostEvent::integerField(std::uint32_t code) const noexcept {
@@ -58,11 +91,9 @@ void HostEvent::setIntegerField(std::uint32_t code, std::int64_t value) { _integ
 std::string jsonText(const HostEvent &event) {
     if (event.digitizer())
         return digitizerText(event);
-    std::string text;
-    appendMember(text, "{\"vendor\":true,\"usagePage\":", event.vendorDefined()->usagePage);
-    appendMember(text, ",\"usage\":", event.vendorDefined()->usage);
-    text.push_back('}');
-    return text;
+    if (event.vendorDefined())
+        return vendorDefinedText(*event.vendorDefined());
+    return accelerometerText(*event.accelerometer());
 }
 
 } // namespace ZorvaTouch

@@ -14,6 +14,7 @@ namespace ZorvaTouch {
 enum class HostEventType : std::uint32_t {
     VendorDefined = 1,
     Digitizer = 11,
+    Accelerometer = 13,
 };
 
 /// Where in its life a gesture is; bits of the host's phase field.
@@ -54,7 +55,15 @@ struct VendorDefinedFields {
     std::vector<std::uint8_t> payload;
 };
 
-/// One event on its way to the host.
+/// Fields of an accelerometer event, in g.
+struct AccelerometerFields {
+    float x = 0, y = 0, z = 0;
+};
+
+/// What an event carries; its place in the list tells the type.
+using HostEventFields = std::variant<DigitizerFields, VendorDefinedFields, AccelerometerFields>;
+
+/// One event on its way to the host, or from it: accelerometer events are the host's.
 ///
 /// Events are shared, reference-counted objects. They are changed only by their maker, before the batch is
 /// handed on.
@@ -66,8 +75,10 @@ public:
     [[nodiscard]] static std::shared_ptr<HostEvent>
     createVendorDefined(std::uint64_t timestamp, VendorDefinedFields fields, std::uint32_t options);
 
-    HostEvent(std::uint64_t timestamp, std::variant<DigitizerFields, VendorDefinedFields> fields,
-              std::uint32_t options);
+    [[nodiscard]] static std::shared_ptr<HostEvent>
+    createAccelerometer(std::uint64_t timestamp, const AccelerometerFields &fields, std::uint32_t options);
+
+    HostEvent(std::uint64_t timestamp, HostEventFields fields, std::uint32_t options);
 
     [[nodiscard]] HostEventType type() const noexcept;
     /// The fields if the event is of that type, else null.
@@ -76,6 +87,9 @@ public:
     }
     [[nodiscard]] const VendorDefinedFields *vendorDefined() const noexcept {
         return std::get_if<VendorDefinedFields>(&_fields);
+    }
+    [[nodiscard]] const AccelerometerFields *accelerometer() const noexcept {
+        return std::get_if<AccelerometerFields>(&_fields);
     }
     [[nodiscard]] std::uint32_t options() const noexcept { return _options; }
 
@@ -92,7 +106,7 @@ public:
 
 private:
     std::uint64_t _timestamp;
-    std::variant<DigitizerFields, VendorDefinedFields> _fields;
+    HostEventFields _fields;
     std::uint32_t _options;
     std::uint16_t _phase = kEventPhaseNone;
     std::map<std::uint32_t, std::int64_t> _integerFields;
@@ -103,7 +117,7 @@ using HostEventList = std::vector<std::shared_ptr<HostEvent>>;
 
 /// An event as compact JSON, for logs and for programs:
 /// `{"mask":2,"phase":1,"y":3,"frame":57}` (phase null when unset) or
-/// `{"vendor":true,"usagePage":65376,"usage":2}`.
+/// `{"vendor":true,"usagePage":65376,"usage":2}` or `{"accelerometer":true,"x":0.5,"y":0.0,"z":-1.0}`.
 [[nodiscard]] std::string jsonText(const HostEvent &event);
 
 } // namespace ZorvaTouch

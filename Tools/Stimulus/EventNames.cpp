@@ -33,6 +33,8 @@ constexpr std::array<std::string_view, kPixelRegionCount> kRegionNames{"none", "
 std::optional<Gesture> gestureOf(const HostEvent &event) noexcept {
     if (event.vendorDefined())
         return Gesture::Reset;
+    if (!event.digitizer())
+        return std::nullopt;
     for (const GestureRow &row : kDigitizerGestures)
         if (row.eventMask == event.digitizer()->eventMask && row.phase == event.phase())
             return row.gesture;

@@ -2,6 +2,8 @@
 
 #include <gtest/gtest.h>
 
+#include <limits>
+
 namespace ZorvaTouch {
 namespace {
 
@@ -79,6 +81,26 @@ TEST(HostEvent, AnUnsetPhaseIsNullInJson) {
 TEST(HostEvent, AVendorDefinedEventIsOneLineOfJson) {
     EXPECT_EQ(jsonText(*HostEvent::createVendorDefined(5, {0xFF60, 2, 0, {}}, 0)),
               R"({"vendor":true,"usagePage":65376,"usage":2})");
+}
+
+TEST(HostEvent, AnAccelerometerEventHasItsTypeAndFields) {
+    const auto event = HostEvent::createAccelerometer(9, {0.5F, -0.25F, 1.0F}, 7);
+    EXPECT_EQ(event->type(), HostEventType::Accelerometer);
+    EXPECT_EQ(static_cast<std::uint32_t>(event->type()), 13U);
+    EXPECT_EQ(event->timestamp(), 9U);
+    EXPECT_EQ(event->options(), 7U);
+    ASSERT_NE(event->accelerometer(), nullptr);
+    EXPECT_EQ(event->accelerometer()->y, -0.25F);
+    EXPECT_EQ(event->digitizer(), nullptr);
+    EXPECT_EQ(event->vendorDefined(), nullptr);
+}
+
+TEST(HostEvent, AnAccelerometerEventIsOneLineOfJson) {
+    EXPECT_EQ(jsonText(*HostEvent::createAccelerometer(5, {0.5F, -0.0F, 1.0F}, 0)),
+              R"({"accelerometer":true,"x":0.5,"y":-0.0,"z":1.0})");
+    constexpr float kInfinity = std::numeric_limits<float>::infinity();
+    EXPECT_EQ(jsonText(*HostEvent::createAccelerometer(5, {kInfinity, 0.0F, 2.0F}, 0)),
+              R"({"accelerometer":true,"x":null,"y":0.0,"z":2.0})");
 }
 
 } // namespace
