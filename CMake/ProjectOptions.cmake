@@ -12,6 +12,10 @@ target_compile_options(zorvatouch_options INTERFACE -ffp-contract=${ZORVA_FP_CON
 target_compile_options(zorvatouch_options INTERFACE
     -Wall -Wextra -Wpedantic -Wconversion -Wsign-conversion -Wshadow -Wnon-virtual-dtor -Woverloaded-virtual
     -Wdouble-promotion -Wimplicit-fallthrough)
+if(CMAKE_CXX_COMPILER_ID MATCHES "Clang")
+    # Which lock guards what: Host/Interface/ThreadAnnotations.h.
+    target_compile_options(zorvatouch_options INTERFACE -Wthread-safety)
+endif()
 if(ZORVA_WERROR)
     target_compile_options(zorvatouch_options INTERFACE -Werror)
 endif()

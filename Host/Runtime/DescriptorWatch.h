@@ -1,0 +1,39 @@
+#pragma once
+
+#include <asio/io_context.hpp>
+#include <asio/posix/descriptor.hpp>
+#include <asio/posix/stream_descriptor.hpp>
+
+#include <utility>
+
+namespace ZorvaTouch::Host {
+
+/// Watches a descriptor of somebody else's for something to read, an error or a hang-up.
+///
+/// The descriptor is put into an epoll set of its own and the set is waited for. So the descriptor keeps its
+/// flags, which waiting for it directly would change for everybody who shares it; it may be watched several
+/// times; and descriptors that cannot be watched are told at once.
+///
+/// Threads: one at a time. The waits' handlers are called by whoever runs the context.
+class [[gnu::visibility("hidden")]] DescriptorWatch {
+public:
+    /// @throws std::system_error  EPERM: the descriptor is always readable, as a regular file is, and not to
+    ///                            be waited for. Any other: it is none, or the system has none left.
+    DescriptorWatch(asio::io_context & context, int descriptor);
+    /// Calls off a wait: its handler hears of it when the context runs, or is destroyed with the context.
+    ~DescriptorWatch();
+    DescriptorWatch(const DescriptorWatch &) = delete;
+    DescriptorWatch &operator=(const DescriptorWatch &) = delete;
+
+    /// Waits until the descriptor is readable, also if it already is. One wait at a time.
+    template <typename Handler> void wait(Handler handler) {
+        _set.async_wait(asio::posix::descriptor_base::wait_read, std::move(handler));
+    }
+    /// Whether a wait would end at once.
+    [[nodiscard]] bool isReadable() noexcept;
+
+private:
+    asio::posix::basic_stream_descriptor<asio::io_context::executor_type> _set;
+};
+
+} // namespace ZorvaTouch::Host
