@@ -1,0 +1,198 @@
+/*
+ * A host in plain C: loads the plug-in, offers it a device made of the functions below, feeds it the reports
+ * of a recording, and prints the gestures that come back.
+ *
+ *     CHost PLUGIN RECORDING
+ *
+ * It needs nothing but the boundary's header and the plug-in's file. Its objects live as long as the process,
+ * so retain and release have nothing to do. A real host differs in what the device reads.
+ */
+#define _POSIX_C_SOURCE 200809L /* getdelim */
+#include <zorvatouch/ZorvaPlugIn.h>
+
+#include <dlfcn.h>
+#include <pthread.h>
+#include <stdio.h>
+#include <stdlib.h>
+#include <string.h>
+/* The functions of a table take what they are given, needed or not. */
+#pragma GCC diagnostic ignored "-Wunused-parameter"
+#define LIVES_ON(Type)                                                                                       \
+    static void retain##Type(Type *object) {}                                                                \
+    static void release##Type(Type *object) {}
+LIVES_ON(ZorvaQueue)
+LIVES_ON(ZorvaDevice)
+LIVES_ON(ZorvaService)
+
+/* ---- A serial queue that the main thread works off ------------------------------------------------ */
+typedef struct Job {
+    ZorvaFunction run;
+    void *context;
+    struct Job *next;
+} Job;
+static pthread_mutex_t lock = PTHREAD_MUTEX_INITIALIZER;
+static pthread_cond_t changed = PTHREAD_COND_INITIALIZER;
+static Job *firstJob, **lastJob = &firstJob;
+static int devicePlayed;
+
+/* Nothing is left over to be discarded: main runs everything. */
+static ZorvaBoolean submit(ZorvaQueue *queue, ZorvaFunction run, ZorvaFunction discard, void *context) {
+    Job *job = malloc(sizeof *job);
+    if (!job)
+        return 0;
+    *job = (Job){run, context, NULL};
+    pthread_mutex_lock(&lock);
+    *lastJob = job;
+    lastJob = &job->next;
+    pthread_cond_signal(&changed);
+    pthread_mutex_unlock(&lock);
+    return 1;
+}
+
+/* Waits for a job and runs it. Returns 0 when there is none and the device has played to its end. */
+static int runNextJob(void) {
+    pthread_mutex_lock(&lock);
+    while (!firstJob && !devicePlayed)
+        pthread_cond_wait(&changed, &lock);
+    Job *job = firstJob;
+    if (job && !(firstJob = job->next))
+        lastJob = &firstJob;
+    pthread_mutex_unlock(&lock);
+    if (job)
+        job->run(job->context);
+    free(job);
+    return job != NULL;
+}
+
+static const ZorvaQueueTable queueTable = {sizeof queueTable, retainZorvaQueue, releaseZorvaQueue, submit};
+static ZorvaQueue queue = {&queueTable};
+
+/* ---- A device that plays the reports of a recording ------------------------------------------------ */
+static const char *position;
+static uint8_t *buffer; /* the service's */
+static size_t bufferSize;
+static ZorvaInputReportCallback reportCallback;
+static void *reportContext;
+static ZorvaRunLoop *deviceLoop;
+static uint64_t deviceSource;
+static ZorvaStatus openOrClose(ZorvaDevice *device, uint32_t options) { return ZORVA_STATUS_SUCCESS; }
+static void registerCallback(ZorvaDevice *device, uint8_t *reports, size_t size,
+                             ZorvaInputReportCallback callback, void *context) {
+    buffer = reports, bufferSize = size, reportCallback = callback, reportContext = context;
+}
+
+/* Reads "Data":"01 2a ... " into the buffer. Returns the report's length, 0 at the end of the recording. */
+static size_t readReport(void) {
+    static const char name[] = "\"Data\":\"";
+    size_t length = 0;
+    if (!(position = strstr(position, name)))
+        return 0;
+    for (position += sizeof name - 1; *position && *position != '"' && length < bufferSize;) {
+        char *end;
+        buffer[length++] = (uint8_t)strtoul(position, &end, 16);
+        position = end + (*end == ' ');
+    }
+    return length;
+}
+
+/* The source is ready: one report, on the input thread. A device that has no more goes away and says so. */
+static void deliverReport(void *device) {
+    const size_t length = readReport();
+    if (length > 0) {
+        reportCallback(reportContext, ZORVA_STATUS_SUCCESS, device, 0, buffer[0], buffer, length, 0);
+        deviceLoop->table->signalSource(deviceLoop, deviceSource);
+        return;
+    }
+    deviceLoop->table->removeSource(deviceLoop, deviceSource);
+    pthread_mutex_lock(&lock);
+    devicePlayed = 1;
+    pthread_cond_signal(&changed);
+    pthread_mutex_unlock(&lock);
+}
+static void scheduleDevice(ZorvaDevice *device, ZorvaRunLoop *loop, const char *mode) {
+    loop->table->retain(loop);
+    deviceLoop = loop;
+    deviceSource = loop->table->addSource(loop, mode, deliverReport, device);
+    loop->table->signalSource(loop, deviceSource);
+}
+static void unscheduleDevice(ZorvaDevice *device, ZorvaRunLoop *loop, const char *mode) {
+    loop->table->removeSource(loop, deviceSource);
+    loop->table->release(loop);
+}
+static ZorvaStatus getFeatureReport(ZorvaDevice *device, uint32_t id, uint8_t *report, size_t *length) {
+    return ZORVA_STATUS_UNSUPPORTED;
+}
+static const ZorvaValue *copyProperty(ZorvaDevice *device, const char *key) { return NULL; }
+static ZorvaBoolean setProperty(ZorvaDevice *device, const char *key, const ZorvaValue *value) { return 0; }
+static const ZorvaDeviceTable deviceTable = {
+    sizeof deviceTable, retainZorvaDevice, releaseZorvaDevice, openOrClose,  openOrClose, registerCallback,
+    scheduleDevice,     unscheduleDevice,  getFeatureReport,   copyProperty, setProperty};
+static ZorvaDevice device = {&deviceTable};
+
+static ZorvaDevice *createDevice(ZorvaService *service) { return &device; }
+static const ZorvaServiceTable serviceTable = {sizeof serviceTable,         retainZorvaService,
+                                               releaseZorvaService,         createDevice,
+                                               NULL /* no accelerometer */, NULL};
+static ZorvaService service = {&serviceTable};
+
+/* ---- The host -------------------------------------------------------------------------------------- */
+static int fail(const char *what, const char *why) {
+    fprintf(stderr, "CHost: %s: %s\n", what, why);
+    return 1;
+}
+
+static void printEvent(void *stream, void *refcon, void *sender, const ZorvaEvent *event, uint32_t options) {
+    static const char *const regions[] = {"nowhere", "play/pause", "volume down", "volume up"};
+    const uint32_t phase = event->table->phase(event);
+    int64_t mask = 0;
+    double region = 0;
+    event->table->integerField(event, kZorvaFieldDigitizerMask, &mask);
+    event->table->floatField(event, kZorvaFieldDigitizerY, &region);
+    const char *gesture = mask == ZORVA_EVENT_MASK_TAP ? "tap"
+                          : phase == kZorvaPhaseBegan  ? "hold begins"
+                          : phase == kZorvaPhaseEnded  ? "hold ends"
+                                                       : "hold moves";
+    if (mask != 0) /* else a finger that may begin something, or that was withdrawn */
+        fprintf(stream, "%-12s%s\n", gesture, regions[(unsigned)region % 4]);
+}
+
+/* The life of a service: queried, started, opened, scheduled; then all of it back. */
+static int runService(PlugInInterfaceTable **plugIn) {
+    HidServiceInterfaceTable **hid = NULL;
+    if ((*plugIn)->QueryInterface(plugIn, kZorvaHidServiceInterface, (void **)&hid) != ZORVA_STATUS_SUCCESS)
+        return fail("the plug-in", "has no HID service interface");
+    if ((*plugIn)->Start(plugIn, NULL, &service) != ZORVA_STATUS_SUCCESS || !(*hid)->open(hid, 0))
+        return fail("the service", "cannot open the device");
+    (*hid)->setEventCallback(hid, printEvent, stdout, NULL);
+    (*hid)->scheduleWithDispatchQueue(hid, &queue);
+    while (runNextJob()) { /* until the device is done, and nothing is on its way any more */
+    }
+    (*hid)->unscheduleFromDispatchQueue(hid, &queue);
+    (*hid)->close(hid, 0);
+    (*plugIn)->Stop(plugIn);
+    (*hid)->Release(hid);
+    return 0;
+}
+
+int main(int argc, char **argv) {
+    char *recording = NULL;
+    size_t size = 0;
+    FILE *file = argc == 3 ? fopen(argv[2], "r") : NULL;
+    if (!file || getdelim(&recording, &size, 0, file) < 0)
+        return fail(argc == 3 ? argv[2] : "usage", argc == 3 ? "cannot be read" : "CHost PLUGIN RECORDING");
+    fclose(file);
+    position = recording;
+    void *plugInFile = dlopen(argv[1], RTLD_NOW | RTLD_LOCAL);
+    if (!plugInFile)
+        return fail("the plug-in", dlerror());
+    ZorvaPlugInFactory factory;
+    *(void **)&factory = dlsym(plugInFile, ZORVA_TOUCH_FACTORY_NAME);
+    PlugInInterfaceTable **plugIn = factory ? factory(NULL, kZorvaHidServicePlugInType) : NULL;
+    if (!plugIn)
+        return fail(argv[1], "makes no HID service");
+    const int status = runService(plugIn);
+    if ((*plugIn)->Release(plugIn) == 0) /* nothing of it is left: its code may go */
+        dlclose(plugInFile);
+    free(recording);
+    return status;
+}
