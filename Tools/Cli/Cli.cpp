@@ -3,6 +3,8 @@
 #include "Shared/Util/Text.h"
 #include "Tools/Cli/CliError.h"
 #include "Tools/Cli/ConvertCommand.h"
+#include "Tools/Cli/DemoCommand.h"
+#include "Tools/Cli/HostCommand.h"
 #include "Tools/Cli/InfoCommand.h"
 #include "Tools/Cli/MakeCommand.h"
 #include "Tools/Cli/Options.h"
@@ -30,6 +32,8 @@ struct Commands {
     ExitStatus operator()(const TrimOptions &options) const { return runTrim(options, environment); }
     ExitStatus operator()(const MakeOptions &options) const { return runMake(options, environment); }
     ExitStatus operator()(const SynthOptions &options) const { return runSynth(options, environment); }
+    ExitStatus operator()(const HostOptions &options) const { return runHost(options, environment); }
+    ExitStatus operator()(const DemoOptions &options) const { return runDemo(options, environment); }
     ExitStatus operator()(const AnswerOptions &options) const {
         environment.output.write(options.text);
         return kExitDone;

@@ -10,7 +10,7 @@ namespace ZorvaTouch::Tools {
 void GestureCounts::add(const ReplayedFrame &frame) noexcept {
     for (const auto &event : frame.events)
         if (const auto gesture = gestureOf(*event))
-            ++_counts[static_cast<std::size_t>(*gesture)];
+            add(*gesture);
 }
 
 void GestureCounts::add(const GestureCounts &other) noexcept {
@@ -35,6 +35,16 @@ void GestureCounts::appendTo(std::string &text) const {
         Util::appendUnsigned(text, of(gesture));
         separator = ", ";
     }
+}
+
+void GestureCounts::appendJsonTo(std::string &text) const {
+    std::string_view separator = "{\"";
+    for (const Gesture gesture : kGestures) {
+        text.append(separator).append(nameOf(gesture)).append("\":");
+        Util::appendUnsigned(text, of(gesture));
+        separator = ",\"";
+    }
+    text.push_back('}');
 }
 
 } // namespace ZorvaTouch::Tools

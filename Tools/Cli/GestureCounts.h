@@ -12,6 +12,7 @@ namespace ZorvaTouch::Tools {
 /// Events by what they tell the host.
 class GestureCounts {
 public:
+    void add(Gesture gesture) noexcept { ++_counts[static_cast<std::size_t>(gesture)]; }
     void add(const ReplayedFrame &frame) noexcept;
     void add(const GestureCounts &other) noexcept;
 
@@ -24,6 +25,8 @@ public:
 
     /// Appends those that are not 0: "may-begin 3, tap 2"; "none" if all are.
     void appendTo(std::string &text) const;
+    /// Appends all of them as an object, {"may-begin":3,"hold-start":0,...}.
+    void appendJsonTo(std::string &text) const;
 
 private:
     std::array<std::uint64_t, kGestureCount> _counts{};

@@ -118,16 +118,6 @@ void appendJsonIntervals(std::string &text, const std::optional<ImageIntervals> 
     text.push_back('}');
 }
 
-void appendJsonEvents(std::string &text, const GestureCounts &counts) {
-    std::string_view separator = R"(,"events":{")";
-    for (const Gesture gesture : kGestures) {
-        text.append(separator).append(nameOf(gesture));
-        appendNumber(text, "\":", counts.of(gesture));
-        separator = ",\"";
-    }
-    text.push_back('}');
-}
-
 void appendJsonStates(std::string &text, const RecordingInfo &info) {
     text.append(R"(,"states":)");
     Util::appendJson(text, PropertyValue::Dictionary(info.states.begin(), info.states.end()));
@@ -141,7 +131,7 @@ void appendForPrograms(std::string &text, const RecordingInfo &info, const std::
     appendNumber(text, R"(,"durationNs":)", info.durationNs);
     appendJsonIntervals(text, info.intervals);
     appendNumber(text, R"(,"disjoint":)", info.disjointCount);
-    appendJsonEvents(text, info.gestures);
+    info.gestures.appendJsonTo(text.append(R"(,"events":)"));
     appendJsonStates(text, info);
     text.append("}\n");
 }

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "Shared/Ports/Log.h"
+#include "Synth/Scenario.h"
 #include "Tools/Cli/Options.h"
 
 #include <cstdint>
@@ -16,11 +17,28 @@ namespace ZorvaTouch::Tools {
 /// A speed: a number above 0, or "inf".
 [[nodiscard]] float parseSpeed(std::string_view text);
 
+/// A number from one limit to the other; their unit is for the message.
+[[nodiscard]] double parseQuantity(std::string_view option, std::string_view text, double lowest,
+                                   double highest, std::string_view unit);
+/// The value of --duration, in seconds: 0.1 to ten hours.
+[[nodiscard]] double parseDuration(std::string_view text);
+
+/// The scenarios' names, "idle, taps, ...".
+[[nodiscard]] std::string scenarioNames();
+/// A scenario's name. The message lists them all.
+[[nodiscard]] const Synth::Scenario &parseScenario(std::string_view option, std::string_view text);
+
+/// A parameter's value as short text, "0.2", "100".
+[[nodiscard]] std::string numberText(double value);
+
 /// "debug", "default" or "error".
 [[nodiscard]] Ports::LogLevel parseLogLevel(std::string_view text);
 
 /// KEY=VALUE. The key may begin with the domains "Pipeline." and "Algs."; it must be one that can be written.
 /// The value is JSON, or a string if it is none.
 [[nodiscard]] Setting parseSetting(std::string_view text);
+
+/// KEY=VALUE for a service: any key as it stands, and a value as above.
+[[nodiscard]] Setting parseProperty(std::string_view text);
 
 } // namespace ZorvaTouch::Tools

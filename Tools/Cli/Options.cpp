@@ -19,12 +19,13 @@ Files: "-" is standard input or output. Recordings are JSON containers.
 
 Examples:
   zorvatouch replay touch.json
+  zorvatouch demo
   zorvatouch make hold.txt - | zorvatouch replay -
   zorvatouch COMMAND --help
 
 Exit status:
   0  done
-  1  a check that was asked for failed
+  1  a check failed, or the service refused what it was told
   2  bad usage, or a file that cannot be read or written
 )";
 
@@ -71,10 +72,25 @@ Examples:
   zorvatouch synth --scenario taps --noise 8 -o - | zorvatouch replay -
 )";
 
+constexpr const char *kHostFooter = R"(
+Examples:
+  zorvatouch host --get Version
+  zorvatouch host --device sim:taps --seed 7 --get Pipeline.Algs.DebugInfo
+  zorvatouch host --device recording:touch.json --set Pipeline.Algs.HoldTimeoutMilliseconds=700
+  zorvatouch host --device sim:day --speed 1 --save live.json
+)";
+
+constexpr const char *kDemoFooter = R"(
+Examples:
+  zorvatouch demo
+  zorvatouch demo --scenario slides --seed 3 --save slides.json
+  zorvatouch demo --forever --quiet
+)";
+
 /// Declares one command: its options are kept as text and read by `read` once they are all there.
 class CommandLine {
 public:
-    CommandLine() : _app("Replays and inspects recordings of the touch sensor.", kProgram) {
+    CommandLine() : _app("Runs the touch sensor's service, and replays and inspects recordings.", kProgram) {
         _app.set_version_flag("--version", std::string(kProgram) + " " + ZORVA_VERSION,
                               "Say the version and exit");
         describeHelp(_app);
@@ -88,6 +104,7 @@ public:
         declareTrim();
         declareMake();
         declareSynth();
+        declareLive();
     }
 
     [[nodiscard]] Options parse(std::span<const std::string> arguments) {
@@ -198,6 +215,12 @@ private:
         _synth.declare(declare("synth", "Make a labelled recording without a device", kSynthFooter));
     }
 
+    void declareLive() {
+        _host.declare(
+            declare("host", "Load the service as a host does, and play, ask and tell", kHostFooter));
+        _demo.declare(declare("demo", "Watch the live service with a simulated finger", kDemoFooter));
+    }
+
     /// The command that was named, or the program if none was.
     [[nodiscard]] CLI::App &chosenApp() {
         const auto chosen = _app.get_subcommands();
@@ -249,6 +272,10 @@ private:
             return _make;
         if (command == "synth")
             return _synth.read();
+        if (command == "host")
+            return _host.read();
+        if (command == "demo")
+            return _demo.read();
         throw CliError("a command is missing");
     }
 
@@ -298,6 +325,8 @@ private:
     TrimOptions _trim;
     MakeOptions _make;
     SynthArguments _synth;
+    HostArguments _host;
+    DemoArguments _demo;
     // As typed.
     std::optional<std::string> _speed, _logLevel, _frame;
     std::vector<std::string> _settings;

@@ -2,6 +2,7 @@
 
 #include "Shared/Ports/Log.h"
 #include "Shared/Util/PropertyValue.h"
+#include "Tools/Cli/LiveOptions.h"
 #include "Tools/Cli/SynthOptions.h"
 
 #include <cstdint>
@@ -14,16 +15,10 @@
 
 namespace ZorvaTouch::Tools {
 
-/// A state that a replay begins with.
-struct Setting {
-    std::string key; ///< the recognizer's, without a domain: "ActivationThreshold"
-    PropertyValue value;
-};
-
 struct ReplayOptions {
     std::vector<std::string> files;
     float speed = std::numeric_limits<float>::infinity(); ///< infinity: without pauses
-    std::vector<Setting> settings;
+    std::vector<Setting> settings; ///< states to begin with; keys are the recognizer's, without a domain
     bool describe = false;
     bool json = false;
     std::optional<std::string> expectFile;
@@ -61,7 +56,7 @@ struct AnswerOptions {
 };
 
 using Options = std::variant<ReplayOptions, InfoOptions, ShowOptions, ConvertOptions, TrimOptions,
-                             MakeOptions, SynthOptions, AnswerOptions>;
+                             MakeOptions, SynthOptions, HostOptions, DemoOptions, AnswerOptions>;
 
 /// Reads a command line.
 /// @param arguments  Without the program's name.

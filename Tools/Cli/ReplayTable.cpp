@@ -1,9 +1,10 @@
 #include "Tools/Cli/ReplayTable.h"
 
 #include "Shared/Util/Text.h"
+#include "Tools/Cli/Counters.h"
+#include "Tools/Cli/GestureLook.h"
 #include "Tools/Cli/Layout.h"
 
-#include <array>
 #include <string_view>
 
 namespace ZorvaTouch::Tools {
@@ -18,49 +19,12 @@ constexpr std::size_t kGestureWidth = 17;
 constexpr std::size_t kRegionWidth = 26;
 constexpr std::size_t kDurationWidth = 9;
 constexpr std::size_t kNumberWidth = 9;
-constexpr std::size_t kLabelWidth = 14;
 constexpr std::string_view kGap = "  ";
-
-struct GestureLook {
-    std::string_view name;
-    Colour colour;
-};
-/// In the order of `Gesture`.
-constexpr std::array<GestureLook, kGestureCount> kGestureLooks{{{"may begin", Colour::None},
-                                                                {"hold", Colour::Cyan},
-                                                                {"hold moves", Colour::Cyan},
-                                                                {"hold ends", Colour::Cyan},
-                                                                {"tap", Colour::Green},
-                                                                {"touch withdrawn", Colour::Yellow},
-                                                                {"device reset", Colour::Magenta}}};
-
-/// In the order of the region codes.
-constexpr std::array<std::string_view, kPixelRegionCount> kRegionTitles{"none", "play/pause", "volume down",
-                                                                        "volume up"};
 
 std::string unsignedText(std::uint64_t value) {
     std::string text;
     Util::appendUnsigned(text, value);
     return text;
-}
-
-void appendLabel(std::string &text, std::string_view label) {
-    text.append(kGap);
-    appendLeft(text, label, kLabelWidth);
-}
-
-/// Appends the counters that are not 0, "numTaps 1, numPlayPause 1", or "none".
-void appendCounters(std::string &text, const PropertyValue &counters) {
-    std::string_view separator;
-    for (const auto &[name, value] : *counters.asDictionary()) {
-        if (*value.asUnsigned() == 0)
-            continue;
-        text.append(separator).append(name).append(" ");
-        Util::appendUnsigned(text, *value.asUnsigned());
-        separator = ", ";
-    }
-    if (separator.empty())
-        text.append("none");
 }
 
 } // namespace
@@ -97,7 +61,7 @@ void ReplayTable::printRow(const Replay &replay, const HostEvent &event, Gesture
         printTitleRow();
     _hasRows = true;
     const ReplayedFrame &frame = replay.frame();
-    const GestureLook &look = kGestureLooks[static_cast<std::size_t>(gesture)];
+    const GestureLook &look = lookOf(gesture);
     const bool isImage = frame.kind == InputKind::Image;
     std::string name;
     appendLeft(name, look.name, kGestureWidth);
@@ -149,8 +113,8 @@ std::string ReplayTable::regionsOf(const HostEvent &event, Gesture gesture) cons
         return {}; // these carry none
     std::string text;
     if (gesture == Gesture::HoldChange)
-        text.append(kRegionTitles[_holdRegion]).append(" → ");
-    return text.append(kRegionTitles[regionOf(event)]);
+        text.append(titleOf(_holdRegion)).append(" → ");
+    return text.append(titleOf(regionOf(event)));
 }
 
 void ReplayTable::end(const Replay &replay) {
@@ -162,17 +126,10 @@ void ReplayTable::end(const Replay &replay) {
 
 void ReplayTable::printCounters(const Replay &replay) {
     const Pipeline &pipeline = replay.pipeline();
-    const PropertyValue counters = pipeline.algs().eventStats().statsDictionary();
-    std::string &text = _output.text();
-    appendLabel(text, "events");
-    _counts.appendTo(text);
-    appendLabel(text.append("\n"), "dispatched");
-    appendCounters(text, *counters.find("Dispatched"));
-    appendLabel(text.append("\n"), "rejected");
-    appendCounters(text, *counters.find("Rejected"));
-    appendLabel(text.append("\n"), "device");
-    text.append("resets ").append(unsignedText(pipeline.resetCount()));
-    text.append(", disjoint images ").append(unsignedText(pipeline.disjointImageCount())).append("\n");
+    appendCounters(_output.text(), {.gestures = _counts,
+                                    .eventStats = pipeline.algs().eventStats().statsDictionary(),
+                                    .resets = pipeline.resetCount(),
+                                    .disjointImages = pipeline.disjointImageCount()});
     _output.wrote();
 }
 

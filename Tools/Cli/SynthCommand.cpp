@@ -4,6 +4,7 @@
 #include "Synth/Stream.h"
 #include "Tools/Cli/Documents.h"
 #include "Tools/Cli/Layout.h"
+#include "Tools/Cli/OptionValues.h"
 
 #include <string>
 

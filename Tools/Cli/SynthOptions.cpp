@@ -1,20 +1,16 @@
 #include "Tools/Cli/SynthOptions.h"
 
-#include "Shared/Util/Text.h"
 #include "Tools/Cli/CliError.h"
 #include "Tools/Cli/OptionValues.h"
 
 #include <CLI/CLI.hpp>
 
-#include <charconv>
 #include <string_view>
 
 namespace ZorvaTouch::Tools {
 namespace {
 
 constexpr const char *kDefaultScenario = "day";
-constexpr double kShortest = 0.1;
-constexpr double kLongest = 36000; ///< s; ten hours are a gigabyte
 
 std::string flagOf(const Synth::ParameterInfo &info) { return "--" + std::string(info.name); }
 
@@ -22,31 +18,13 @@ std::string helpOf(const Synth::ParameterInfo &info) {
     return std::string(info.meaning) + " (" + numberText(info.standard) + ")";
 }
 
-/// A number within limits; their unit is for the message.
-double parseQuantity(const std::string &option, std::string_view text, double lowest, double highest,
-                     std::string_view unit) {
-    double value = 0;
-    const char *const end = text.data() + text.size();
-    const auto [stop, error] = std::from_chars(text.data(), end, value);
-    if (error == std::errc() && stop == end && value >= lowest && value <= highest) // a NaN is refused too
-        return value;
-    throw CliError(option + ": '" + std::string(text) + "' is no number from " + numberText(lowest) + " to " +
-                   numberText(highest) + " (" + std::string(unit) + ")");
-}
-
-const Synth::Scenario &parseScenario(std::string_view name) {
+const Synth::Scenario &scenarioOrHint(std::string_view name) {
     if (const Synth::Scenario *scenario = Synth::scenarioNamed(name))
         return *scenario;
     throw CliError("--scenario: '" + std::string(name) + "' is no scenario; --list shows them");
 }
 
 } // namespace
-
-std::string numberText(double value) {
-    std::string text;
-    Util::appendShortest(text, value);
-    return text.ends_with(".0") ? text.substr(0, text.size() - 2) : text;
-}
 
 void SynthArguments::declare(CLI::App &command) {
     command.add_option("--scenario", _scenario, "What happens; day unless given")->type_name("NAME");
@@ -66,7 +44,7 @@ void SynthArguments::declare(CLI::App &command) {
 SynthOptions SynthArguments::read() const {
     SynthOptions options;
     options.list = _list;
-    options.scenario = &parseScenario(_scenario.value_or(kDefaultScenario));
+    options.scenario = &scenarioOrHint(_scenario.value_or(kDefaultScenario));
     options.parameters = Synth::parametersOf(*options.scenario);
     for (std::size_t i = 0; i < Synth::kParameterCount; ++i) {
         const Synth::ParameterInfo &info = Synth::parameters()[i];
@@ -76,8 +54,7 @@ SynthOptions SynthArguments::read() const {
     }
     if (_seed)
         options.seed = parseCount("--seed", *_seed, 0);
-    options.duration = _duration ? parseQuantity("--duration", *_duration, kShortest, kLongest, "s")
-                                 : options.scenario->duration;
+    options.duration = _duration ? parseDuration(*_duration) : options.scenario->duration;
     if (!_out && !_list)
         throw CliError("-o is required");
     options.out = _out.value_or("");

@@ -23,9 +23,6 @@ struct SynthOptions {
     bool list = false; ///< the scenarios, instead of a recording
 };
 
-/// A parameter's value as short text, "0.2", "100".
-[[nodiscard]] std::string numberText(double value);
-
 /// The options of `synth` as they are typed. There is a flag for each parameter.
 class SynthArguments {
 public:

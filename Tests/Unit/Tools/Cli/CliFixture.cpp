@@ -38,6 +38,8 @@ void StringSink::write(std::string_view written) {
     if (isFull)
         throw Host::FileFailure("write", ENOSPC);
     text.append(written);
+    if (onWrite)
+        onWrite(text);
 }
 
 void CliFixture::SetUp() {
@@ -67,6 +69,14 @@ CliFixture::Run CliFixture::run(std::initializer_list<std::string> arguments) {
             },
         .usesColour = usesColour,
         .showsProgress = showsProgress,
+        .screenColumns = [this] { return screenColumns; },
+        .watchStop =
+            [this](std::function<void()> onStop) {
+                stop = std::move(onStop);
+                return nullptr;
+            },
+        .plugIn = ZORVA_TEST_PLUGIN,
+        .stateFolder = path("state"),
     };
     const int status = runCli(resolved, environment);
     return {status, outputSink.text, errorSink.text};

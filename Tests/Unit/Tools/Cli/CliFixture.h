@@ -5,7 +5,9 @@
 
 #include <gtest/gtest.h>
 
+#include <cstddef>
 #include <filesystem>
+#include <functional>
 #include <initializer_list>
 #include <optional>
 #include <string>
@@ -21,6 +23,7 @@ public:
 
     std::string text;
     bool isFull = false;
+    std::function<void(const std::string &text)> onWrite; ///< told of all the text so far, when set
 };
 
 /// Runs the command line without a process, in a folder of its own.
@@ -60,6 +63,8 @@ protected:
     std::optional<Ports::LogLevel> logLevel; ///< that the last run asked for
     bool usesColour = false;
     bool showsProgress = false;
+    std::size_t screenColumns = 0;
+    std::function<void()> stop; ///< what a run that can be stopped is stopped with, while it goes on
 
 private:
     std::filesystem::path _folder;

@@ -1,0 +1,98 @@
+#include "Tools/Cli/ElectrodeLine.h"
+
+#include "Shared/Pixel.h"
+#include "Tools/Cli/GestureLook.h"
+#include "Tools/Cli/Layout.h"
+
+#include <algorithm>
+#include <array>
+#include <string_view>
+
+namespace ZorvaTouch::Tools {
+namespace {
+
+/// Eighths of a character, from none on.
+constexpr std::array<std::string_view, 9> kBars{" ", "▁", "▂", "▃", "▄", "▅", "▆", "▇", "█"};
+constexpr std::int32_t kCountsPerStep = 75; ///< scaled counts: a firm finger gives some 600
+constexpr std::int32_t kTouched = 200;      ///< the recognizer's default threshold
+
+constexpr std::size_t kTimeWidth = 9;    // "   3.20 s"; more after hours
+constexpr std::size_t kRegionWidth = 13; // "  volume down"
+constexpr std::size_t kWideCell = 3;
+constexpr std::size_t kNarrowCell = 2;
+constexpr std::uint64_t kNanosecondsPerCentisecond = 10'000'000;
+
+/// In the order of the region codes.
+constexpr std::array<Colour, kPixelRegionCount> kRegionColours{Colour::None, Colour::Green, Colour::Magenta,
+                                                               Colour::Cyan};
+
+using Values = std::array<std::int32_t, kElectrodeCount>;
+
+/// Signals with the electrodes' gains, as the recognizer sees them.
+Values scaledValues(const InputReport::Image &image) {
+    static const Pixels pixels = makePixels();
+    Values values;
+    for (std::size_t i = 0; i < kElectrodeCount; ++i)
+        values[i] = static_cast<std::int32_t>(static_cast<float>(image.signals[i]) * pixels[i].gain);
+    return values;
+}
+
+PixelRegion regionOfIndex(std::size_t electrode) {
+    return regionOfElectrode(static_cast<std::int32_t>(electrode));
+}
+
+/// The region of the strongest electrode, if that is touched.
+PixelRegion activeRegion(const Values &values) {
+    const auto *const strongest = std::max_element(values.begin(), values.end());
+    return *strongest > kTouched ? regionOfIndex(static_cast<std::size_t>(strongest - values.begin()))
+                                 : kPixelRegionNone;
+}
+
+std::string_view barOf(std::int32_t value) {
+    const std::int32_t steps = (std::max(value, 0) + kCountsPerStep / 2) / kCountsPerStep;
+    return kBars[std::min(static_cast<std::size_t>(steps), kBars.size() - 1)];
+}
+
+/// The time and a gap.
+std::string timeText(std::uint64_t timeNs) {
+    const std::uint64_t centiseconds = timeNs / kNanosecondsPerCentisecond;
+    const std::string decimals = std::to_string(centiseconds % 100);
+    std::string text;
+    appendRight(text,
+                std::to_string(centiseconds / 100) + (decimals.size() < 2 ? ".0" : ".") + decimals + " s",
+                kTimeWidth);
+    return text.append("  ");
+}
+
+void appendElectrodes(std::string &text, const Values &values, std::size_t cellWidth, bool usesColour) {
+    const PixelRegion active = activeRegion(values);
+    for (std::size_t i = 0; i < kElectrodeCount; ++i) {
+        std::string cell(1, static_cast<char>('A' + i));
+        cell.append(barOf(values[i]));
+        const bool isActive = active != kPixelRegionNone && regionOfIndex(i) == active;
+        appendColoured(text, cell, isActive ? kRegionColours[active] : Colour::Dim, usesColour);
+        text.append(i + 1 < kElectrodeCount ? cellWidth - kNarrowCell : 0, ' ');
+    }
+}
+
+} // namespace
+
+std::string electrodeLine(const InputReport::Image &image, std::uint64_t timeNs, std::size_t columns,
+                          bool usesColour) {
+    constexpr std::size_t kWide = kElectrodeCount * kWideCell - 1;
+    constexpr std::size_t kNarrow = kElectrodeCount * kNarrowCell;
+    if (columns < kNarrow)
+        return {};
+    const Values values = scaledValues(image);
+    const std::string time = timeText(timeNs);
+    std::string text;
+    if (columns >= time.size() + kWide)
+        text.append(time);
+    appendElectrodes(text, values, columns >= kWide ? kWideCell : kNarrowCell, usesColour);
+    const PixelRegion active = activeRegion(values);
+    if (columns >= time.size() + kWide + kRegionWidth && active != kPixelRegionNone)
+        appendColoured(text.append("  "), titleOf(active), kRegionColours[active], usesColour);
+    return text;
+}
+
+} // namespace ZorvaTouch::Tools

@@ -1,0 +1,57 @@
+#pragma once
+
+#include "Host/Runtime/PlugInFile.h"
+#include "Plugin/ZorvaPlugIn.h"
+#include "Shared/Util/PropertyValue.h"
+
+#include <optional>
+#include <string>
+
+namespace ZorvaTouch::Tools {
+
+/// A HID service from a plug-in's file, driven as any host does: through the factory and the two tables
+/// alone. What was begun is undone in the end, in the opposite order.
+///
+/// Threads: one; the service's own threads are its own affair.
+class HostedService {
+public:
+    /// Loads the file and makes a service.
+    /// @throws CliError  The file cannot be loaded, or is no plug-in with such a service.
+    explicit HostedService(std::string file);
+    ~HostedService();
+    HostedService(const HostedService &) = delete;
+    HostedService &operator=(const HostedService &) = delete;
+
+    /// Probes and starts the service, and opens its device.
+    /// @param offered  Borrowed; the service keeps what it needs.
+    /// @throws CliError
+    void start(ZorvaService *offered);
+    /// @param target  Handed back with each event.
+    void setEventCallback(ZorvaEventCallback callback, void *target) noexcept;
+    void schedule(ZorvaQueue *queue) noexcept;
+    /// Afterwards no report is handled any more; events may still wait in the queue.
+    void unschedule() noexcept;
+
+    /// Nothing: there is no such property.
+    [[nodiscard]] std::optional<PropertyValue> property(const std::string &key) const;
+    /// @return Whether the service took it.
+    [[nodiscard]] bool setProperty(const std::string &key, const PropertyValue &value);
+
+    [[nodiscard]] const std::string &file() const noexcept { return _file; }
+    /// The property "Version" as it is written, "26.0.0"; "?" if there is none.
+    [[nodiscard]] std::string version() const;
+
+private:
+    [[noreturn]] void fail(const std::string &problem) const;
+    void require(ZorvaStatus status, const char *operation) const;
+
+    const std::string _file;
+    Host::PlugInFile _plugIn;
+    PlugInInterfaceTable **_plug = nullptr;    ///< one reference
+    HidServiceInterfaceTable **_hid = nullptr; ///< one reference
+    ZorvaQueue *_queue = nullptr;              ///< while scheduled
+    bool _isStarted = false;
+    bool _isOpen = false;
+};
+
+} // namespace ZorvaTouch::Tools

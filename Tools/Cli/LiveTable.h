@@ -1,0 +1,45 @@
+#pragma once
+
+#include "Tools/Cli/Environment.h"
+#include "Tools/Cli/Layout.h"
+#include "Tools/Cli/LivePrinter.h"
+
+#include <string_view>
+
+namespace ZorvaTouch::Tools {
+
+/// Prints a run for a person: a row for each gesture, and on a screen the electrodes below.
+///
+/// Whatever else is printed meanwhile must come after `clear`: the lowest line is drawn anew all the time.
+class LiveTable final : public LivePrinter {
+public:
+    /// @param environment  Borrowed. Its output is written to.
+    /// @param showsFinger  There is a column for what really happened.
+    LiveTable(Environment &environment, bool showsFinger)
+        : _environment(environment), _showsFinger(showsFinger) {}
+    ~LiveTable() override;
+    LiveTable(const LiveTable &) = delete;
+    LiveTable &operator=(const LiveTable &) = delete;
+
+    void print(const LiveGesture &gesture) override;
+    void printSilence(std::uint64_t timeNs, const std::string &what, bool isMissed) override;
+    void refresh(std::uint64_t timeNs, const std::optional<InputReport::Image> &image) override;
+    void clear() override;
+
+private:
+    /// A row's cells, as text.
+    struct Cells {
+        std::string_view time, gesture, region, duration, action, finger;
+    };
+
+    void beginRow();
+    void appendCells(std::string &row, const Cells &cells, Colour gestureColour, bool usesColour) const;
+    void eraseLine();
+
+    Environment &_environment;
+    const bool _showsFinger;
+    bool _hasRows = false;
+    bool _isLineVisible = false;
+};
+
+} // namespace ZorvaTouch::Tools
