@@ -12,6 +12,12 @@ build_all() {
     build "$1" -k 0
 }
 
+# build_some PRESET TARGET...
+build_some() {
+    configure "$1"
+    build "$@"
+}
+
 # tidy PRESET: the sources of the product, with the commands they are compiled with there.
 tidy() {
     local tool log=${logs:?}/tidy.log sources="^${root:?}/(Shared|Host|Service|Plugin|Synth|Tools)/"
