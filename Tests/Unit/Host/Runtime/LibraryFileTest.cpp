@@ -106,8 +106,8 @@ private:
 
 TEST(LibraryFile, HasTheFourTracePoints) {
     EXPECT_THAT(LibraryFile().probes(),
-                UnorderedElementsAre("zorvatouch:input_report 1", "zorvatouch:dispatch_land 1",
-                                     "zorvatouch:dispatch_event 2", "zorvatouch:firmware_event 2"));
+                UnorderedElementsAre("zorvatouch:input_report 5", "zorvatouch:dispatch_land 2",
+                                     "zorvatouch:dispatch_event 3", "zorvatouch:firmware_event 3"));
 }
 
 /// Whether a name is this library's own, or the table or type of one of its classes or of the ports'.
