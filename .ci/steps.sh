@@ -3,7 +3,8 @@
 
 check_scripts() {
     shellcheck --external-sources .ci/determinism .ci/format .ci/run .ci/words .ci/*.sh \
-        scripts/bench scripts/fuzz scripts/run scripts/test scripts/lib/*.sh
+        scripts/bench scripts/fuzz scripts/run scripts/test scripts/test-kernel scripts/lib/*.sh \
+        Tests/Kernel/*.sh Tests/Kernel/lib/*.sh Tests/Kernel/lib/*-root
 }
 
 # build_all PRESET: everything in it, tests included, on to the end for all that is wrong.
