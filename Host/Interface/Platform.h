@@ -33,7 +33,7 @@ public:
 
 /// Points in the road of a report that tools outside of the process can watch.
 namespace Trace {
-inline constexpr std::uint32_t kInputReport = 0x2B150180;   ///< the report's first four bytes, each an argument
+inline constexpr std::uint32_t kInputReport = 0x2B150180; ///< the report's first four bytes, each an argument
 inline constexpr std::uint32_t kDispatchLand = 0x2B150184;  ///< number of events
 inline constexpr std::uint32_t kDispatchEvent = 0x2B150188; ///< type, phase
 inline constexpr std::uint32_t kFirmwareEvent = 0x2B15018C; ///< event code, payload as a big-endian number
