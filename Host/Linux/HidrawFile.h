@@ -1,0 +1,32 @@
+#pragma once
+
+#include "Host/Linux/HidrawNode.h"
+#include "Host/Linux/UniqueFd.h"
+
+#include <string>
+
+namespace ZorvaTouch::Linux {
+
+/// A hidraw node of the system.
+class HidrawFile final : public HidrawNode {
+public:
+    /// Opens what is under that path, as "/dev/hidraw0", and keeps it from programs that are started.
+    [[nodiscard]] static OpenedNode open(const std::string &path, int flags) noexcept;
+    /// Opens it whenever it is asked to.
+    /// @throws std::bad_alloc
+    [[nodiscard]] static HidrawOpener opener(std::string path);
+
+    explicit HidrawFile(UniqueFd descriptor) noexcept : _descriptor(std::move(descriptor)) {}
+
+    [[nodiscard]] int descriptor() const noexcept override { return _descriptor.get(); }
+    [[nodiscard]] IoResult read(std::span<std::uint8_t> buffer) noexcept override;
+    [[nodiscard]] IoResult info(HidrawInfo &stored) noexcept override;
+    [[nodiscard]] IoResult text(HidrawText which, std::span<std::uint8_t> buffer) noexcept override;
+    [[nodiscard]] IoResult reportDescriptor(std::span<std::uint8_t> buffer) noexcept override;
+    [[nodiscard]] IoResult featureReport(std::span<std::uint8_t> buffer) noexcept override;
+
+private:
+    const UniqueFd _descriptor;
+};
+
+} // namespace ZorvaTouch::Linux

@@ -1,0 +1,54 @@
+#include "Host/Linux/HidrawFile.h"
+
+#include <gtest/gtest.h>
+
+#include <fcntl.h>
+
+#include <array>
+#include <cerrno>
+
+namespace ZorvaTouch::Linux {
+namespace {
+
+// What can be opened here is no HID device: the calls get as far as the system,
+// which refuses them.
+
+TEST(HidrawFile, SaysWhyItCannotBeOpened) {
+    const OpenedNode opened = HidrawFile::open("/dev/no-such-node", O_RDWR | O_NONBLOCK);
+    EXPECT_EQ(opened.node, nullptr);
+    EXPECT_EQ(opened.errorNumber, ENOENT);
+    EXPECT_EQ(HidrawFile::open("/dev/null/hidraw0", O_RDONLY).errorNumber, ENOTDIR);
+}
+
+TEST(HidrawFile, IsNotInheritedByProgramsThatAreStarted) {
+    const OpenedNode opened = HidrawFile::opener("/dev/null")(O_RDWR | O_NONBLOCK);
+    ASSERT_NE(opened.node, nullptr);
+    EXPECT_EQ(::fcntl(opened.node->descriptor(), F_GETFD) & FD_CLOEXEC, FD_CLOEXEC);
+    EXPECT_EQ(::fcntl(opened.node->descriptor(), F_GETFL) & (O_ACCMODE | O_NONBLOCK), O_RDWR | O_NONBLOCK);
+}
+
+TEST(HidrawFile, ReadsWhatComes) {
+    std::array<std::uint8_t, 4> buffer{1, 2, 3, 4};
+    IoResult result = HidrawFile::open("/dev/zero", O_RDONLY).node->read(buffer);
+    EXPECT_EQ(result.errorNumber, 0);
+    EXPECT_EQ(result.count, 4u);
+    EXPECT_EQ(buffer, (std::array<std::uint8_t, 4>{}));
+    result = HidrawFile::open("/dev/null", O_RDONLY).node->read(buffer);
+    EXPECT_EQ(result.errorNumber, 0);
+    EXPECT_EQ(result.count, 0u) << "the end";
+    EXPECT_EQ(HidrawFile::open("/", O_RDONLY).node->read(buffer).errorNumber, EISDIR);
+}
+
+TEST(HidrawFile, OfNoHidDeviceAnswersNothing) {
+    const OpenedNode opened = HidrawFile::open("/dev/null", O_RDWR);
+    std::array<std::uint8_t, 64> buffer{4};
+    HidrawInfo info;
+    EXPECT_EQ(opened.node->info(info).errorNumber, ENOTTY);
+    for (const HidrawText which : {HidrawText::Name, HidrawText::PhysicalPath, HidrawText::UniqueId})
+        EXPECT_EQ(opened.node->text(which, buffer).errorNumber, ENOTTY);
+    EXPECT_EQ(opened.node->reportDescriptor(buffer).errorNumber, ENOTTY);
+    EXPECT_EQ(opened.node->featureReport(buffer).errorNumber, ENOTTY);
+}
+
+} // namespace
+} // namespace ZorvaTouch::Linux
