@@ -1,5 +1,6 @@
 #include "Bench/Latency/Link.h"
 
+#include <fcntl.h>
 #include <sys/socket.h>
 #include <unistd.h>
 
@@ -11,6 +12,7 @@ namespace ZorvaTouch::Bench {
 Link::Link() {
     if (::socketpair(AF_UNIX, SOCK_SEQPACKET | SOCK_CLOEXEC, 0, _ends) != 0)
         throw std::system_error(errno, std::generic_category(), "socketpair");
+    ::fcntl(_ends[0], F_SETFL, O_NONBLOCK); // as a driver opens its nodes
 }
 
 Link::~Link() {

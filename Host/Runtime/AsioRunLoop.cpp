@@ -54,6 +54,8 @@ RunOutcome AsioRunLoop::runOneSource(std::string_view mode) {
 }
 
 void AsioRunLoop::runClosures(std::string_view mode) {
+    if (!_hasClosures) // one that comes right now keeps the pass from waiting
+        return;
     // Those that come meanwhile wait for the next time.
     for (std::size_t left = closureCount(mode); left != 0; --left) {
         auto job = takeClosure(mode);
@@ -82,6 +84,7 @@ std::optional<Job> AsioRunLoop::takeClosure(std::string_view mode) {
         return std::nullopt;
     Job job = std::move(closure->job);
     _closures.erase(closure);
+    _hasClosures = !_closures.empty();
     _lastUserCode = ++_lastMoment;
     return job;
 }
@@ -191,6 +194,7 @@ void AsioRunLoop::enqueue(std::string_view mode, Job &job) {
     const MutexLock lock(_mutex);
     _closures.push_back({std::string(mode), {}});
     _closures.back().job = std::move(job);
+    _hasClosures = true;
     wake();
 }
 

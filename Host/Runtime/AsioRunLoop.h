@@ -11,6 +11,7 @@
 #include <asio/executor_work_guard.hpp>
 #include <asio/io_context.hpp>
 
+#include <atomic>
 #include <cstddef>
 #include <cstdint>
 #include <deque>
@@ -98,6 +99,8 @@ private:
     bool _isStopAsked ZORVA_GUARDED_BY(_mutex) = false;
     Sources _sources ZORVA_GUARDED_BY(_mutex);
     std::deque<Closure> _closures ZORVA_GUARDED_BY(_mutex);
+    std::atomic<bool> _hasClosures{
+        false}; ///< changed under the lock; a look without it saves most passes one
     std::uint64_t _lastNumber ZORVA_GUARDED_BY(_mutex) = 0;
     std::uint64_t _lastMoment ZORVA_GUARDED_BY(_mutex) = 0;   ///< counts what happens, to tell its order
     std::uint64_t _lastUserCode ZORVA_GUARDED_BY(_mutex) = 0; ///< when one began or ended last

@@ -10,9 +10,10 @@ namespace ZorvaTouch::Host {
 
 /// Watches a descriptor of somebody else's for something to read, an error or a hang-up.
 ///
-/// The descriptor is put into an epoll set of its own and the set is waited for. So the descriptor keeps its
-/// flags, which waiting for it directly would change for everybody who shares it; it may be watched several
-/// times; and descriptors that cannot be watched are told at once.
+/// Waiting for a descriptor makes it non-blocking, for everybody who shares it. One that is so already is
+/// waited for as it is. Any other is put into an epoll set of its own and the set is waited for, which costs
+/// a little more; so is one that is watched several times. Descriptors that cannot be watched are told at
+/// once.
 ///
 /// Threads: one at a time. The waits' handlers are called by whoever runs the context.
 class [[gnu::visibility("hidden")]] DescriptorWatch {
@@ -27,13 +28,14 @@ public:
 
     /// Waits until the descriptor is readable, also if it already is. One wait at a time.
     template <typename Handler> void wait(Handler handler) {
-        _set.async_wait(asio::posix::descriptor_base::wait_read, std::move(handler));
+        _watched.async_wait(asio::posix::descriptor_base::wait_read, std::move(handler));
     }
     /// Whether a wait would end at once.
     [[nodiscard]] bool isReadable() noexcept;
 
 private:
-    asio::posix::basic_stream_descriptor<asio::io_context::executor_type> _set;
+    asio::posix::basic_stream_descriptor<asio::io_context::executor_type> _watched; ///< it, or its set
+    bool _isSet = false;
 };
 
 } // namespace ZorvaTouch::Host

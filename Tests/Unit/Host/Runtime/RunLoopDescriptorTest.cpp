@@ -12,8 +12,16 @@
 namespace ZorvaTouch::Host {
 namespace {
 
-class RunLoopDescriptors : public RuntimeTests::RunLoopFixture {
+/// With a pipe that blocks and with one that does not: the two are waited for in different ways.
+class RunLoopDescriptors : public RuntimeTests::RunLoopFixture, public ::testing::WithParamInterface<bool> {
 protected:
+    RunLoopDescriptors() {
+        if (GetParam()) {
+            ::fcntl(pipe.readEnd(), F_SETFL, O_NONBLOCK);
+            ::fcntl(otherPipe.readEnd(), F_SETFL, O_NONBLOCK);
+        }
+    }
+
     RuntimeTests::Pipe pipe;
     RuntimeTests::Pipe otherPipe;
 };
@@ -21,7 +29,7 @@ protected:
 using RuntimeTests::Pipe;
 using RuntimeTests::ScopedThread;
 
-TEST_F(RunLoopDescriptors, AreServedAsLongAsTheyAreReadable) {
+TEST_P(RunLoopDescriptors, AreServedAsLongAsTheyAreReadable) {
     addDescriptor('p', pipe.readEnd(), [this] { served.push_back(pipe.read()); });
     pipe.write("12");
     passes(2);
@@ -32,7 +40,7 @@ TEST_F(RunLoopDescriptors, AreServedAsLongAsTheyAreReadable) {
     EXPECT_EQ(served, "p1p2sp3");
 }
 
-TEST_F(RunLoopDescriptors, WakeTheLoopWhenSomethingComes) {
+TEST_P(RunLoopDescriptors, WakeTheLoopWhenSomethingComes) {
     addDescriptor('p', pipe.readEnd());
     const auto isInPass = platform.createSemaphore();
     loop->perform("mode", [&] { isInPass->signal(); });
@@ -44,7 +52,7 @@ TEST_F(RunLoopDescriptors, WakeTheLoopWhenSomethingComes) {
     EXPECT_EQ(served, "p");
 }
 
-TEST_F(RunLoopDescriptors, MayBeAddedWhileTheLoopWaits) {
+TEST_P(RunLoopDescriptors, MayBeAddedWhileTheLoopWaits) {
     addSource('s');
     pipe.write("1");
     const auto isInPass = platform.createSemaphore();
@@ -57,7 +65,7 @@ TEST_F(RunLoopDescriptors, MayBeAddedWhileTheLoopWaits) {
     EXPECT_EQ(served, "p");
 }
 
-TEST_F(RunLoopDescriptors, MayBeSignalledAsWell) {
+TEST_P(RunLoopDescriptors, MayBeSignalledAsWell) {
     const auto p = addDescriptor('p', pipe.readEnd(), [this] {
         if (served.size() == 2)
             served.push_back(pipe.read());
@@ -69,7 +77,7 @@ TEST_F(RunLoopDescriptors, MayBeSignalledAsWell) {
     EXPECT_EQ(served, "pp1");
 }
 
-TEST_F(RunLoopDescriptors, ThatAreNeverReadAndSourcesThatNeverRestTakeTurns) {
+TEST_P(RunLoopDescriptors, ThatAreNeverReadAndSourcesThatNeverRestTakeTurns) {
     std::uint64_t s = 0;
     s = addSource('s', [&] { signal(s); });
     pipe.write("1");
@@ -82,7 +90,7 @@ TEST_F(RunLoopDescriptors, ThatAreNeverReadAndSourcesThatNeverRestTakeTurns) {
         EXPECT_EQ(std::count(served.begin(), served.end(), name), 3) << name << " in " << served;
 }
 
-TEST_F(RunLoopDescriptors, OfAnotherModeStayReady) {
+TEST_P(RunLoopDescriptors, OfAnotherModeStayReady) {
     pipe.write("1");
     otherPipe.write("2");
     addDescriptor(
@@ -97,7 +105,7 @@ TEST_F(RunLoopDescriptors, OfAnotherModeStayReady) {
 
 // --- Readiness that is gone ------------------------------------------------------------------------
 
-TEST_F(RunLoopDescriptors, AreNotServedWhenAnotherSourceHasReadEverything) {
+TEST_P(RunLoopDescriptors, AreNotServedWhenAnotherSourceHasReadEverything) {
     addDescriptor('.', pipe.readEnd(), [this] { served.push_back(pipe.read()); });
     addDescriptor('.', pipe.readEnd(), [this] { served.push_back(pipe.read()); });
     const auto s = addSource('s');
@@ -110,7 +118,7 @@ TEST_F(RunLoopDescriptors, AreNotServedWhenAnotherSourceHasReadEverything) {
     EXPECT_EQ(served, ".1s.2.3s.4s.5s");
 }
 
-TEST_F(RunLoopDescriptors, AreNotServedWhenAClosureHasReadEverything) {
+TEST_P(RunLoopDescriptors, AreNotServedWhenAClosureHasReadEverything) {
     addDescriptor('.', pipe.readEnd(), [this] { served.push_back(pipe.read()); });
     const auto s = addSource('s');
     pipe.write("1");
@@ -124,7 +132,7 @@ TEST_F(RunLoopDescriptors, AreNotServedWhenAClosureHasReadEverything) {
     EXPECT_EQ(served, ".1ss");
 }
 
-TEST_F(RunLoopDescriptors, DoNotInheritThePredecessorsReadiness) {
+TEST_P(RunLoopDescriptors, DoNotInheritThePredecessorsReadiness) {
     // Two become ready at once. Before the second is served, an empty pipe takes its place.
     const Pipe empty;
     const auto p = addDescriptor('p', pipe.readEnd(), [this] { (void)pipe.read(); });
@@ -145,7 +153,7 @@ TEST_F(RunLoopDescriptors, DoNotInheritThePredecessorsReadiness) {
     EXPECT_EQ(served.substr(1), "s");
 }
 
-TEST_F(RunLoopDescriptors, DoNotInheritItWithinAServiceEither) {
+TEST_P(RunLoopDescriptors, DoNotInheritItWithinAServiceEither) {
     const Pipe empty;
     std::uint64_t sources[2] = {};
     const auto replaceOther = [&](int own) {
@@ -168,7 +176,7 @@ TEST_F(RunLoopDescriptors, DoNotInheritItWithinAServiceEither) {
 
 // --- Ends and errors -------------------------------------------------------------------------------
 
-TEST_F(RunLoopDescriptors, ThatWereHungUpAreServedUntilTheyAreRemoved) {
+TEST_P(RunLoopDescriptors, ThatWereHungUpAreServedUntilTheyAreRemoved) {
     std::uint64_t p = 0;
     p = addDescriptor('p', pipe.readEnd(), [&] {
         if (served.size() == 3)
@@ -180,7 +188,7 @@ TEST_F(RunLoopDescriptors, ThatWereHungUpAreServedUntilTheyAreRemoved) {
     EXPECT_EQ(served, "ppp");
 }
 
-TEST_F(RunLoopDescriptors, ThatHaveFailedAreServedUntilTheyAreRemoved) {
+TEST_P(RunLoopDescriptors, ThatHaveFailedAreServedUntilTheyAreRemoved) {
     std::uint64_t p = 0;
     p = addDescriptor('p', pipe.writeEnd(), [&] {
         if (served.size() == 2)
@@ -192,7 +200,7 @@ TEST_F(RunLoopDescriptors, ThatHaveFailedAreServedUntilTheyAreRemoved) {
     EXPECT_EQ(served, "pp");
 }
 
-TEST_F(RunLoopDescriptors, OfRegularFilesAreAlwaysReadable) {
+TEST_P(RunLoopDescriptors, OfRegularFilesAreAlwaysReadable) {
     const RuntimeTests::LogText file;
     const auto f = addDescriptor('f', ::fileno(file.file()));
     passes(2);
@@ -206,7 +214,7 @@ TEST_F(RunLoopDescriptors, OfRegularFilesAreAlwaysReadable) {
     EXPECT_EQ(served, "fffss");
 }
 
-TEST_F(RunLoopDescriptors, ThatAreNoneAreRefusedWithALine) {
+TEST_P(RunLoopDescriptors, ThatAreNoneAreRefusedWithALine) {
     EXPECT_EQ(addDescriptor('p', -1), 0u);
     EXPECT_EQ(log.text(), "error subsystem=org.zorva.hid.ZorvaTouch category=RunLoop "
                           "refused: watch descriptor -1: Bad file descriptor\n");
@@ -215,15 +223,15 @@ TEST_F(RunLoopDescriptors, ThatAreNoneAreRefusedWithALine) {
 
 // --- The owner's descriptor ------------------------------------------------------------------------
 
-TEST_F(RunLoopDescriptors, KeepTheirFlags) {
+TEST_P(RunLoopDescriptors, KeepTheirFlags) {
     const int before = ::fcntl(pipe.readEnd(), F_GETFL);
     pipe.write("1");
     addDescriptor('p', pipe.readEnd(), [&] { EXPECT_EQ(::fcntl(pipe.readEnd(), F_GETFL), before); });
     passes(1);
-    EXPECT_EQ(before & O_NONBLOCK, 0);
+    EXPECT_EQ((before & O_NONBLOCK) != 0, GetParam());
 }
 
-TEST_F(RunLoopDescriptors, StayOpenWhenTheLoopIsGone) {
+TEST_P(RunLoopDescriptors, StayOpenWhenTheLoopIsGone) {
     addDescriptor('p', pipe.readEnd());
     pipe.write("1");
     passes(1);
@@ -236,11 +244,11 @@ std::ptrdiff_t openDescriptors() {
     return std::distance(std::filesystem::directory_iterator("/proc/self/fd"), {});
 }
 
-TEST_F(RunLoopDescriptors, CostNothingOnceTheyAreRemovedOrTheLoopIsGone) {
+TEST_P(RunLoopDescriptors, CostNothingOnceTheyAreRemovedOrTheLoopIsGone) {
     remove(addDescriptor('p', pipe.readEnd())); // what the loop itself needs is there from now on
     const auto before = openDescriptors();
     const auto p = addDescriptor('p', pipe.readEnd());
-    EXPECT_GT(openDescriptors(), before);
+    EXPECT_EQ(openDescriptors(), before + (GetParam() ? 0 : 1)) << "one that blocks needs a set of its own";
     remove(p);
     EXPECT_EQ(openDescriptors(), before);
 
@@ -251,7 +259,7 @@ TEST_F(RunLoopDescriptors, CostNothingOnceTheyAreRemovedOrTheLoopIsGone) {
     EXPECT_EQ(openDescriptors(), before);
 }
 
-TEST_F(RunLoopDescriptors, AreForgottenWhenTheyAreRemoved) {
+TEST_P(RunLoopDescriptors, AreForgottenWhenTheyAreRemoved) {
     for (int round = 0; round < 3; ++round) {
         auto reused = std::make_unique<Pipe>(); // gets the numbers that the last one had
         reused->write("1");
@@ -262,6 +270,9 @@ TEST_F(RunLoopDescriptors, AreForgottenWhenTheyAreRemoved) {
     EXPECT_EQ(pass(), RunOutcome::Finished);
     EXPECT_EQ(served, "ppp");
 }
+
+INSTANTIATE_TEST_SUITE_P(Pipes, RunLoopDescriptors, ::testing::Bool(),
+                         [](const auto &pipes) { return pipes.param ? "NonBlocking" : "Blocking"; });
 
 } // namespace
 } // namespace ZorvaTouch::Host
