@@ -13,6 +13,12 @@ build_all() {
     build "$1" -k 0
 }
 
+# build_product PRESET: everything but the tests, which the other compiler's build holds to the same.
+build_product() {
+    configure "$1" ZORVA_TESTS=OFF
+    build "$1" -k 0
+}
+
 # build_some PRESET TARGET...
 build_some() {
     configure "$1"
