@@ -1,20 +1,8 @@
 #include "Host/Linux/HidrawDevice.h"
+#include "Plugin/Guarded.h"
 #include "Plugin/ValueObject.h"
 
 namespace ZorvaTouch::Linux {
-namespace {
-
-/// Runs what may run out of memory on behalf of the other side, which must not see an exception.
-/// @return The body's result, or `failure` if it threw.
-template <typename Result, typename Body> Result guarded(Result failure, const Body &body) noexcept {
-    try {
-        return body();
-    } catch (...) { // the failure is the answer
-        return failure;
-    }
-}
-
-} // namespace
 
 /// The device as the other side sees it.
 struct HidrawDevice::Entries {

@@ -1,7 +1,7 @@
 #include "Host/Simulated/Accelerometer.h"
 
-#include "Host/Simulated/Guarded.h"
 #include "Plugin/EventObject.h"
+#include "Plugin/Guarded.h"
 #include "Plugin/ValueObject.h"
 
 #include <string_view>

@@ -1,6 +1,6 @@
 #include "Host/Simulated/Device.h"
 
-#include "Host/Simulated/Guarded.h"
+#include "Plugin/Guarded.h"
 
 namespace ZorvaTouch::Simulated {
 

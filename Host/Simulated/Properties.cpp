@@ -1,6 +1,6 @@
 #include "Host/Simulated/Properties.h"
 
-#include "Host/Simulated/Guarded.h"
+#include "Plugin/Guarded.h"
 #include "Plugin/ValueObject.h"
 
 #include <algorithm>

@@ -1,6 +1,6 @@
 #include "Host/Simulated/Service.h"
 
-#include "Host/Simulated/Guarded.h"
+#include "Plugin/Guarded.h"
 
 #include <utility>
 

@@ -1,6 +1,6 @@
 #pragma once
 
-namespace ZorvaTouch::Simulated {
+namespace ZorvaTouch {
 
 /// Runs what may run out of memory on behalf of the other side, which must not see an exception.
 /// @return The body's result, or `failure` if it threw.
@@ -12,4 +12,4 @@ template <typename Result, typename Body> Result guarded(Result failure, const B
     }
 }
 
-} // namespace ZorvaTouch::Simulated
+} // namespace ZorvaTouch
