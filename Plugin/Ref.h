@@ -2,6 +2,7 @@
 
 #include "Plugin/ZorvaPlugIn.h"
 
+#include <type_traits>
 #include <utility>
 
 namespace ZorvaTouch {
@@ -27,6 +28,10 @@ public:
 
     Ref(const Ref &other) noexcept : Ref(retain(other._object)) {}
     Ref(Ref &&other) noexcept : _object(std::exchange(other._object, nullptr)) {}
+    /// From a reference to what is such an object and more.
+    template <typename Derived>
+    requires std::is_base_of_v<Object, Derived> Ref(Ref<Derived> other)
+    noexcept : _object(other.release()) {}
     Ref &operator=(Ref other) noexcept {
         std::swap(_object, other._object);
         return *this;

@@ -1,9 +1,9 @@
 #pragma once
 
 #include "Host/Interface/Mutex.h"
+#include "Host/Objects/Inbox.h"
+#include "Host/Objects/Properties.h"
 #include "Host/Simulated/FeatureReports.h"
-#include "Host/Simulated/Inbox.h"
-#include "Host/Simulated/Properties.h"
 #include "Plugin/BoundaryObject.h"
 
 #include <atomic>
@@ -75,7 +75,7 @@ public:
     /// @param report  The whole report, report ID first.
     void setFeatureReport(std::uint32_t reportId, std::vector<std::uint8_t> report);
     void failFeatureReport(std::uint32_t reportId, ZorvaStatus status);
-    [[nodiscard]] Properties &properties() noexcept { return _properties; }
+    [[nodiscard]] Host::Properties &properties() noexcept { return _properties; }
 
     [[nodiscard]] DeviceCounters counters() const;
 
@@ -119,10 +119,10 @@ private:
     void finishReport();
     void dropWaiting() ZORVA_REQUIRES(_lock);
 
-    Properties _properties;
+    Host::Properties _properties;
     mutable Host::Mutex _lock;
     std::condition_variable_any _settled; ///< reports were settled, or the source went
-    Inbox<Report> _inbox ZORVA_GUARDED_BY(_lock){kQueueCapacity};
+    Host::Inbox<Report> _inbox ZORVA_GUARDED_BY(_lock){kQueueCapacity};
     Ref<Device> _scheduled ZORVA_GUARDED_BY(_lock); ///< itself, while it has a place on a loop
     Callback _callback ZORVA_GUARDED_BY(_lock);
     FeatureReports _featureReports ZORVA_GUARDED_BY(_lock) = FeatureReports::ofDevice();

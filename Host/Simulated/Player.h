@@ -2,7 +2,7 @@
 
 #include "Host/Interface/Mutex.h"
 #include "Host/Interface/Platform.h"
-#include "Host/Simulated/Accelerometer.h"
+#include "Host/Objects/Accelerometer.h"
 #include "Host/Simulated/Device.h"
 #include "Host/Simulated/VirtualClock.h"
 #include "Shared/Frame.h"
@@ -26,8 +26,8 @@ using FrameSource = std::function<std::optional<Frame>()>;
 
 /// Where frames go. Observers run on the playing thread and may be empty.
 struct PlayerOutput {
-    Ref<Device> device;               ///< gets the input reports
-    Ref<Accelerometer> accelerometer; ///< gets the metadata "Accel"; may be null
+    Ref<Device> device;                     ///< gets the input reports
+    Ref<Host::Accelerometer> accelerometer; ///< gets the metadata "Accel"; may be null
 
     /// A report has been delivered, and in lock-step handled or dropped.
     std::function<void(const Frame &frame)> onReport;

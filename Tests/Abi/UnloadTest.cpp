@@ -1,9 +1,9 @@
+#include "Host/Objects/Accelerometer.h"
+#include "Host/Objects/EventSystem.h"
+#include "Host/Objects/Service.h"
 #include "Host/Runtime/PlugInFile.h"
 #include "Host/Runtime/SerialQueue.h"
-#include "Host/Simulated/Accelerometer.h"
 #include "Host/Simulated/Device.h"
-#include "Host/Simulated/EventSystem.h"
-#include "Host/Simulated/Service.h"
 #include "Tests/Support/FramesScript.h"
 
 #include <gtest/gtest.h>
@@ -61,9 +61,9 @@ void useService(PlugInInterfaceTable **plugIn, Host::SerialQueue &queue) {
     ASSERT_EQ((*plugIn)->QueryInterface(plugIn, kZorvaHidServiceInterface, &found), ZORVA_STATUS_SUCCESS);
     const auto hid = static_cast<HidServiceInterfaceTable **>(found);
     const auto device = Simulated::Device::create();
-    const auto system = Simulated::EventSystem::create();
-    const auto accelerometer = Simulated::Accelerometer::create(system);
-    const auto offered = Simulated::Service::create(device, system);
+    const auto system = Host::EventSystem::create();
+    const auto accelerometer = Host::Accelerometer::create(system);
+    const auto offered = Host::Service::create(device, system);
     std::binary_semaphore tapped(0);
     ASSERT_EQ((*plugIn)->Start(plugIn, nullptr, offered.get()), ZORVA_STATUS_SUCCESS);
     ASSERT_EQ((*hid)->open(hid, 0), 1);

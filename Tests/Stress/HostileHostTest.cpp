@@ -23,7 +23,7 @@ class HostileHost : public ServiceTest {
 protected:
     HostileHost() {
         platform.journal.setLevel(Ports::LogLevel::Error);
-        offeredService = Simulated::Service::create(device);
+        offeredService = Host::Service::create(device);
     }
     ~HostileHost() override {
         if (plugIn)

@@ -1,5 +1,5 @@
+#include "Host/Objects/Accelerometer.h"
 #include "Host/Runtime/SerialQueue.h"
-#include "Host/Simulated/Accelerometer.h"
 #include "Plugin/ValueObject.h"
 #include "Shared/Pipeline.h"
 #include "Tests/Support/SensorSequence.h"

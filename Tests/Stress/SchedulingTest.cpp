@@ -111,7 +111,7 @@ TEST_F(StressOfScheduling, IsReleasedByTheQueueOrTheThreadWhicheverIsLast) {
         PlugInInterfaceTable **const first = service.getPluginInterface();
         HidServiceInterfaceTable **const second = service.getServiceInterface();
         const auto other = Simulated::Device::create();
-        const auto offered = Simulated::Service::create(other);
+        const auto offered = Host::Service::create(other);
         (*first)->Start(first, nullptr, offered.get());
         (*second)->setEventCallback(second, EventJournal::receive, &events, nullptr);
         (*second)->scheduleWithDispatchQueue(second, serialQueue.boundary());

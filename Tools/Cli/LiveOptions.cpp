@@ -12,7 +12,6 @@ namespace {
 
 constexpr std::string_view kFingerPrefix = "sim:";
 constexpr std::string_view kRecordingPrefix = "recording:";
-constexpr double kAccelRate = 100; ///< Hz, what the service asks for
 
 // The demo's twenty seconds: with this seed they have taps in all regions, holds that move, a double tap, a
 // palm that is rejected, and a graze that is not.
@@ -20,15 +19,6 @@ constexpr const char *kDemoScenario = "day";
 constexpr const char *kDemoSeed = "1811";
 constexpr const char *kDemoDuration = "20";
 constexpr double kDemoPauseScale = 0.15; ///< a day in which no time is lost, nor any image
-
-SimulatedFinger fingerOf(const Synth::Scenario &scenario) {
-    SimulatedFinger finger{.scenario = &scenario,
-                           .parameters = Synth::parametersOf(scenario),
-                           .seed = 1,
-                           .seconds = scenario.duration};
-    finger.parameters.accelRate = kAccelRate;
-    return finger;
-}
 
 void hurry(Synth::Parameters &parameters) {
     parameters.pauseScale = kDemoPauseScale;

@@ -3,8 +3,8 @@
 #include "Shared/FrameList.h"
 #include "Tools/Cli/Counters.h"
 #include "Tools/Cli/Environment.h"
-#include "Tools/Cli/HostedService.h"
 #include "Tools/Cli/LiveSource.h"
+#include "Tools/Hosting/HostedService.h"
 
 #include <cstddef>
 #include <string>

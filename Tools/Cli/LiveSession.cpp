@@ -25,9 +25,9 @@ std::uint64_t nanoseconds(std::uint64_t ticks, Ports::Clock &clock) {
 
 LiveSession::LiveSession(const LiveOptions &options, EventInbox &inbox, Environment &environment)
     : _options(options), _platform(openLogs(environment), isVirtual() ? &_virtualClock : nullptr),
-      _inbox(inbox), _events(Simulated::EventSystem::create()),
-      _accelerometer(Simulated::Accelerometer::create(_events)), _device(Simulated::Device::create()),
-      _offered(Simulated::Service::create(_device, _events)), _queue(kQueueThreadName) {
+      _inbox(inbox), _events(Host::EventSystem::create()),
+      _accelerometer(Host::Accelerometer::create(_events)), _device(Simulated::Device::create()),
+      _offered(Host::Service::create(_device, _events)), _queue(kQueueThreadName) {
     for (const char *const key : kIdentityKeys)
         _device->properties().makeReadOnly(key);
     _service.emplace(options.plugIn);

@@ -1,17 +1,17 @@
 #pragma once
 
+#include "Host/Objects/Accelerometer.h"
+#include "Host/Objects/EventSystem.h"
+#include "Host/Objects/Service.h"
 #include "Host/Runtime/SerialQueue.h"
-#include "Host/Simulated/Accelerometer.h"
 #include "Host/Simulated/Device.h"
-#include "Host/Simulated/EventSystem.h"
-#include "Host/Simulated/Service.h"
 #include "Host/Simulated/VirtualClock.h"
 #include "Tools/Cli/DeferredLogs.h"
 #include "Tools/Cli/Environment.h"
 #include "Tools/Cli/EventInbox.h"
-#include "Tools/Cli/HostedService.h"
 #include "Tools/Cli/LiveSource.h"
 #include "Tools/Cli/SessionPlatform.h"
+#include "Tools/Hosting/HostedService.h"
 
 #include <cstdint>
 #include <memory>
@@ -92,10 +92,10 @@ private:
     DeferredLogs *_deferredLogs = nullptr; ///< the platform's, when standard output is a screen
     SessionPlatform _platform;
     EventInbox &_inbox;
-    std::shared_ptr<Simulated::EventSystem> _events;
-    Ref<Simulated::Accelerometer> _accelerometer;
+    std::shared_ptr<Host::EventSystem> _events;
+    Ref<Host::Accelerometer> _accelerometer;
     Ref<Simulated::Device> _device;
-    Ref<Simulated::Service> _offered;
+    Ref<Host::Service> _offered;
     Host::SerialQueue _queue;
     std::optional<HostedService> _service; ///< loaded last, unloaded first
     std::uint64_t _startNs = 0;

@@ -1,23 +1,12 @@
 #pragma once
 
-#include "Host/Simulated/Player.h"
-#include "Synth/Parameters.h"
-#include "Synth/Scenario.h"
 #include "Tools/Cli/Environment.h"
+#include "Tools/Hosting/FingerSource.h"
 
 #include <cstdint>
-#include <optional>
 #include <string>
 
 namespace ZorvaTouch::Tools {
-
-/// Somebody who touches a simulated sensor.
-struct SimulatedFinger {
-    const Synth::Scenario *scenario = nullptr; ///< one of the table
-    Synth::Parameters parameters;
-    std::uint64_t seed = 1;
-    std::optional<double> seconds; ///< nothing: without an end
-};
 
 /// Frames for a simulated device.
 struct LiveSource {

@@ -63,7 +63,7 @@ TEST_F(ServiceLifecycle, StartCreatesTheDeviceAndStopReleasesIt) {
 }
 
 TEST_F(ServiceLifecycle, StartFailsWithoutADevice) {
-    offeredService = Simulated::Service::create({});
+    offeredService = Host::Service::create({});
     EXPECT_EQ((*plugIn)->Start(plugIn, nullptr, offeredService.get()), 0xE00002BEu);
     EXPECT_EQ((*plugIn)->Start(plugIn, nullptr, nullptr), 0xE00002BEu);
     ZorvaService hollow{nullptr};

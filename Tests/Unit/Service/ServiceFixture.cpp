@@ -50,12 +50,12 @@ ServiceTest::~ServiceTest() {
 }
 
 void ServiceTest::attachAccelerometer() {
-    eventSystem = Simulated::EventSystem::create();
-    accelerometer = Simulated::Accelerometer::create(eventSystem);
+    eventSystem = Host::EventSystem::create();
+    accelerometer = Host::Accelerometer::create(eventSystem);
 }
 
 void ServiceTest::start() {
-    offeredService = Simulated::Service::create(device, eventSystem);
+    offeredService = Host::Service::create(device, eventSystem);
     start(offeredService.get());
 }
 

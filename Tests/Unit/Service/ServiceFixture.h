@@ -1,9 +1,9 @@
 #pragma once
 
-#include "Host/Simulated/Accelerometer.h"
+#include "Host/Objects/Accelerometer.h"
+#include "Host/Objects/EventSystem.h"
+#include "Host/Objects/Service.h"
 #include "Host/Simulated/Device.h"
-#include "Host/Simulated/EventSystem.h"
-#include "Host/Simulated/Service.h"
 #include "Plugin/ZorvaPlugIn.h"
 #include "Shared/Util/PropertyValue.h"
 #include "Tests/Support/FramesScript.h"
@@ -84,10 +84,10 @@ protected:
     [[nodiscard]] std::uint32_t referenceCount(); ///< of the service
 
     TestPlatform platform;
-    std::shared_ptr<Simulated::EventSystem> eventSystem;
-    Ref<Simulated::Accelerometer> accelerometer;
+    std::shared_ptr<Host::EventSystem> eventSystem;
+    Ref<Host::Accelerometer> accelerometer;
     const Ref<Simulated::Device> device = Simulated::Device::create();
-    Ref<Simulated::Service> offeredService;
+    Ref<Host::Service> offeredService;
     const Ref<ManualQueue> queue = ManualQueue::create();
     EventJournal events;
     PlugInInterfaceTable **plugIn = nullptr;

@@ -14,6 +14,9 @@
 namespace ZorvaTouch::Simulated {
 namespace {
 
+using Host::Accelerometer;
+using Host::EventSystem;
+
 using Texts = std::vector<std::string>;
 
 constexpr double kAtOnce = std::numeric_limits<double>::infinity();

@@ -1,11 +1,11 @@
 #pragma once
 
-#include "Host/Simulated/EventSystem.h"
+#include "Host/Objects/EventSystem.h"
 #include "Plugin/BoundaryObject.h"
 
 #include <memory>
 
-namespace ZorvaTouch::Simulated {
+namespace ZorvaTouch::Host {
 
 /// A client of the event system as the other side sees it: a handle of what the system keeps about it.
 ///
@@ -30,4 +30,4 @@ private:
     const EventSystem::ClientId _id;
 };
 
-} // namespace ZorvaTouch::Simulated
+} // namespace ZorvaTouch::Host

@@ -9,7 +9,7 @@
 #include <string>
 #include <string_view>
 
-namespace ZorvaTouch::Simulated {
+namespace ZorvaTouch::Host {
 
 /// Named values, as a device or a service of the host has them. A name without a value reads as null.
 ///
@@ -39,9 +39,9 @@ public:
 private:
     void store(std::string_view key, PropertyValue value) ZORVA_REQUIRES(_lock);
 
-    mutable Host::Mutex _lock;
+    mutable Mutex _lock;
     PropertyValue::Dictionary _values ZORVA_GUARDED_BY(_lock);
     std::set<std::string, std::less<>> _readOnly ZORVA_GUARDED_BY(_lock);
 };
 
-} // namespace ZorvaTouch::Simulated
+} // namespace ZorvaTouch::Host

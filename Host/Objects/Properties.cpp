@@ -1,4 +1,4 @@
-#include "Host/Simulated/Properties.h"
+#include "Host/Objects/Properties.h"
 
 #include "Plugin/Guarded.h"
 #include "Plugin/ValueObject.h"
@@ -6,9 +6,7 @@
 #include <algorithm>
 #include <utility>
 
-namespace ZorvaTouch::Simulated {
-
-using Host::MutexLock;
+namespace ZorvaTouch::Host {
 
 Properties::Properties(PropertyValue::Dictionary values) : _values(std::move(values)) {}
 
@@ -61,4 +59,4 @@ void Properties::store(std::string_view key, PropertyValue value) {
         _values.erase(found);
 }
 
-} // namespace ZorvaTouch::Simulated
+} // namespace ZorvaTouch::Host

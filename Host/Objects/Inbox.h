@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Host/Simulated/LoopSource.h"
+#include "Host/Objects/LoopSource.h"
 
 #include <cstddef>
 #include <cstdint>
@@ -10,7 +10,7 @@
 #include <thread>
 #include <utility>
 
-namespace ZorvaTouch::Simulated {
+namespace ZorvaTouch::Host {
 
 /// What has arrived and waits to be served on a run loop, one item in each pass; bounded, and what does not
 /// fit is refused. Items may arrive while there is no place on a loop; they wait.
@@ -97,4 +97,4 @@ private:
     std::thread::id _server; ///< whoever served this place last
 };
 
-} // namespace ZorvaTouch::Simulated
+} // namespace ZorvaTouch::Host

@@ -5,9 +5,17 @@
 #include "Shared/Util/PropertyValue.h"
 
 #include <optional>
+#include <stdexcept>
 #include <string>
 
 namespace ZorvaTouch::Tools {
+
+/// A plug-in that cannot be loaded or a service that cannot be started. `what()` is one line that begins with
+/// the file's name.
+class HostingError : public std::runtime_error {
+public:
+    using std::runtime_error::runtime_error;
+};
 
 /// A HID service from a plug-in's file, driven as any host does: through the factory and the two tables
 /// alone. What was begun is undone in the end, in the opposite order.
@@ -16,7 +24,7 @@ namespace ZorvaTouch::Tools {
 class HostedService {
 public:
     /// Loads the file and makes a service.
-    /// @throws CliError  The file cannot be loaded, or is no plug-in with such a service.
+    /// @throws HostingError  The file cannot be loaded, or is no plug-in with such a service.
     explicit HostedService(std::string file);
     ~HostedService();
     HostedService(const HostedService &) = delete;
@@ -24,7 +32,7 @@ public:
 
     /// Probes and starts the service, and opens its device.
     /// @param offered  Borrowed; the service keeps what it needs.
-    /// @throws CliError
+    /// @throws HostingError
     void start(ZorvaService *offered);
     /// @param target  Handed back with each event.
     void setEventCallback(ZorvaEventCallback callback, void *target) noexcept;

@@ -1,6 +1,6 @@
-#include "Host/Simulated/EventSystem.h"
+#include "Host/Objects/EventSystem.h"
 
-#include "Host/Simulated/Accelerometer.h"
+#include "Host/Objects/Accelerometer.h"
 #include "Plugin/EventObject.h"
 #include "Plugin/ValueObject.h"
 #include "Tests/Unit/Host/Simulated/LoopThread.h"
@@ -12,8 +12,11 @@
 #include <functional>
 #include <string>
 
-namespace ZorvaTouch::Simulated {
+namespace ZorvaTouch::Host {
 namespace {
+
+using Simulated::LoopThread;
+using Simulated::ManualLoop;
 
 using Texts = std::vector<std::string>;
 
@@ -338,4 +341,4 @@ TEST(EventThreads, ASampleIsHeardOnceTheWaitIsOver) {
 }
 
 } // namespace
-} // namespace ZorvaTouch::Simulated
+} // namespace ZorvaTouch::Host

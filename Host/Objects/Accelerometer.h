@@ -1,7 +1,7 @@
 #pragma once
 
-#include "Host/Simulated/EventSystem.h"
-#include "Host/Simulated/Properties.h"
+#include "Host/Objects/EventSystem.h"
+#include "Host/Objects/Properties.h"
 #include "Plugin/BoundaryObject.h"
 #include "Shared/HostEvent.h"
 
@@ -9,7 +9,7 @@
 #include <memory>
 #include <optional>
 
-namespace ZorvaTouch::Simulated {
+namespace ZorvaTouch::Host {
 
 /// An accelerometer among the services of the host's event system: "PrimaryUsagePage" 0xFF00,
 /// "PrimaryUsage" 3. It takes the property "ReportInterval", a double in microseconds, and no other; it sends
@@ -54,4 +54,4 @@ private:
     const std::weak_ptr<EventSystem> _system;
 };
 
-} // namespace ZorvaTouch::Simulated
+} // namespace ZorvaTouch::Host

@@ -1,8 +1,8 @@
-#include "Host/Simulated/LoopSource.h"
+#include "Host/Objects/LoopSource.h"
 
 #include <utility>
 
-namespace ZorvaTouch::Simulated {
+namespace ZorvaTouch::Host {
 
 void LoopSource::schedule(ZorvaRunLoop *loop, const char *mode, ZorvaFunction perform, void *context) {
     _mode = mode;
@@ -35,4 +35,4 @@ void LoopSource::signal() noexcept {
         _loop->table->signalSource(_loop.get(), _source);
 }
 
-} // namespace ZorvaTouch::Simulated
+} // namespace ZorvaTouch::Host

@@ -1,14 +1,12 @@
-#include "Host/Simulated/EventSystem.h"
+#include "Host/Objects/EventSystem.h"
 
-#include "Host/Simulated/Accelerometer.h"
-#include "Host/Simulated/EventClient.h"
+#include "Host/Objects/Accelerometer.h"
+#include "Host/Objects/EventClient.h"
 
 #include <algorithm>
 #include <utility>
 
-namespace ZorvaTouch::Simulated {
-
-using Host::MutexLock;
+namespace ZorvaTouch::Host {
 
 std::shared_ptr<EventSystem> EventSystem::create() { return std::shared_ptr<EventSystem>(new EventSystem); }
 
@@ -214,4 +212,4 @@ EventCounters EventSystem::counters() const {
     return counters;
 }
 
-} // namespace ZorvaTouch::Simulated
+} // namespace ZorvaTouch::Host

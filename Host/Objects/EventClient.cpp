@@ -1,11 +1,11 @@
-#include "Host/Simulated/EventClient.h"
+#include "Host/Objects/EventClient.h"
 
 #include "Plugin/Guarded.h"
 #include "Plugin/ValueObject.h"
 
 #include <utility>
 
-namespace ZorvaTouch::Simulated {
+namespace ZorvaTouch::Host {
 
 struct EventClient::Entries {
     /// Runs what returns nothing and is given up without memory.
@@ -64,4 +64,4 @@ void EventClient::serve(void *client) noexcept {
     Entries::run([&] { self->_system->serve(self->_id); });
 }
 
-} // namespace ZorvaTouch::Simulated
+} // namespace ZorvaTouch::Host

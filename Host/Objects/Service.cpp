@@ -1,12 +1,10 @@
-#include "Host/Simulated/Service.h"
+#include "Host/Objects/Service.h"
 
 #include "Plugin/Guarded.h"
 
 #include <utility>
 
-namespace ZorvaTouch::Simulated {
-
-using Host::MutexLock;
+namespace ZorvaTouch::Host {
 
 /// The service as the other side sees it.
 struct Service::Entries {
@@ -38,15 +36,15 @@ const ZorvaServiceTable Service::kTableWithoutEvents{
     .setProperty = Entries::setProperty,
 };
 
-Ref<Service> Service::create(Ref<Device> device, std::shared_ptr<EventSystem> system) {
+Ref<Service> Service::create(Ref<ZorvaDevice> device, std::shared_ptr<EventSystem> system) {
     return Ref<Service>::adopt(new Service(std::move(device), std::move(system)));
 }
 
-Service::Service(Ref<Device> device, std::shared_ptr<EventSystem> system)
+Service::Service(Ref<ZorvaDevice> device, std::shared_ptr<EventSystem> system)
     : BoundaryObject(system ? &kTable : &kTableWithoutEvents), _system(std::move(system)),
       _device(std::move(device)) {}
 
-void Service::setDevice(Ref<Device> device) {
+void Service::setDevice(Ref<ZorvaDevice> device) {
     MutexLock lock(_lock);
     std::swap(_device, device);
 }
@@ -82,4 +80,4 @@ std::uint32_t Service::clientsCreated() const {
     return _clientsCreated;
 }
 
-} // namespace ZorvaTouch::Simulated
+} // namespace ZorvaTouch::Host

@@ -1,9 +1,8 @@
-#include "Tools/Cli/HostedService.h"
+#include "Tools/Hosting/HostedService.h"
 
 #include "Plugin/ValueObject.h"
 #include "Shared/Util/Hex.h"
 #include "Shared/Util/Json.h"
-#include "Tools/Cli/CliError.h"
 
 #include <array>
 #include <charconv>
@@ -19,7 +18,7 @@ Host::PlugInFile openPlugIn(const std::string &file) {
     try {
         return Host::PlugInFile(file);
     } catch (const std::runtime_error &error) {
-        throw CliError(error.what());
+        throw HostingError(error.what());
     }
 }
 
@@ -49,7 +48,7 @@ HostedService::HostedService(std::string file) : _file(std::move(file)), _plugIn
     try {
         factory = _plugIn.factory(ZORVA_TOUCH_FACTORY_NAME);
     } catch (const std::runtime_error &error) {
-        throw CliError(error.what());
+        throw HostingError(error.what());
     }
     _plug = static_cast<PlugInInterfaceTable **>(factory(nullptr, kZorvaHidServicePlugInType));
     if (!_plug)
@@ -112,7 +111,7 @@ std::string HostedService::version() const {
     return version ? versionText(*version) : "?";
 }
 
-void HostedService::fail(const std::string &problem) const { throw CliError(_file + ": " + problem); }
+void HostedService::fail(const std::string &problem) const { throw HostingError(_file + ": " + problem); }
 
 void HostedService::require(ZorvaStatus status, const char *operation) const {
     if (status != ZORVA_STATUS_SUCCESS)

@@ -1,11 +1,14 @@
-#include "Host/Simulated/Service.h"
+#include "Host/Objects/Service.h"
 
+#include "Host/Simulated/Device.h"
 #include "Plugin/ValueObject.h"
 
 #include <gtest/gtest.h>
 
-namespace ZorvaTouch::Simulated {
+namespace ZorvaTouch::Host {
 namespace {
+
+using Simulated::Device;
 
 ZorvaStatus openOf(ZorvaDevice *device) { return device->table->open(device, 0); }
 
@@ -75,4 +78,4 @@ TEST(SimulatedService, KeepsWhatIsSet) {
 }
 
 } // namespace
-} // namespace ZorvaTouch::Simulated
+} // namespace ZorvaTouch::Host

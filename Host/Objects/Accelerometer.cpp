@@ -1,4 +1,4 @@
-#include "Host/Simulated/Accelerometer.h"
+#include "Host/Objects/Accelerometer.h"
 
 #include "Plugin/EventObject.h"
 #include "Plugin/Guarded.h"
@@ -7,7 +7,7 @@
 #include <string_view>
 #include <utility>
 
-namespace ZorvaTouch::Simulated {
+namespace ZorvaTouch::Host {
 namespace {
 
 constexpr const char *kReportInterval = "ReportInterval";
@@ -76,4 +76,4 @@ std::optional<double> Accelerometer::reportInterval() const {
     return interval ? std::optional(*interval) : std::nullopt;
 }
 
-} // namespace ZorvaTouch::Simulated
+} // namespace ZorvaTouch::Host

@@ -5,7 +5,7 @@
 #include <cstdint>
 #include <string>
 
-namespace ZorvaTouch::Simulated {
+namespace ZorvaTouch::Host {
 
 /// The place of something on a run loop: the loop, which it keeps, the mode, and its source there.
 ///
@@ -42,4 +42,4 @@ private:
     std::uint64_t _source = 0;
 };
 
-} // namespace ZorvaTouch::Simulated
+} // namespace ZorvaTouch::Host

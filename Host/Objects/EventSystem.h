@@ -1,7 +1,7 @@
 #pragma once
 
 #include "Host/Interface/Mutex.h"
-#include "Host/Simulated/Inbox.h"
+#include "Host/Objects/Inbox.h"
 #include "Plugin/Ref.h"
 #include "Shared/HostEvent.h"
 #include "Shared/Util/PropertyValue.h"
@@ -15,7 +15,7 @@
 #include <span>
 #include <vector>
 
-namespace ZorvaTouch::Simulated {
+namespace ZorvaTouch::Host {
 
 class Accelerometer;
 class EventClient;
@@ -105,7 +105,7 @@ private:
     [[nodiscard]] bool isListening(ClientId id, std::uint64_t number) const;
     void finishEvent(ClientId id, bool wasHeard);
 
-    mutable Host::Mutex _lock;
+    mutable Mutex _lock;
     std::condition_variable_any _settled; ///< events were settled, or a source went
     std::vector<Service> _services ZORVA_GUARDED_BY(_lock);
     std::map<ClientId, Client> _clients ZORVA_GUARDED_BY(_lock);
@@ -113,4 +113,4 @@ private:
     EventCounters _counters ZORVA_GUARDED_BY(_lock); ///< but for the clients
 };
 
-} // namespace ZorvaTouch::Simulated
+} // namespace ZorvaTouch::Host

@@ -1,17 +1,16 @@
 #pragma once
 
 #include "Host/Interface/Mutex.h"
-#include "Host/Simulated/Device.h"
-#include "Host/Simulated/EventSystem.h"
-#include "Host/Simulated/Properties.h"
+#include "Host/Objects/EventSystem.h"
+#include "Host/Objects/Properties.h"
 #include "Plugin/BoundaryObject.h"
 
 #include <cstdint>
 #include <memory>
 
-namespace ZorvaTouch::Simulated {
+namespace ZorvaTouch::Host {
 
-/// The place where a simulated device is attached: what a plug-in is started with. It keeps the device and
+/// The place where a device is attached: what a plug-in is started with. It keeps the device and
 /// the event system. What the plug-in sets is among its properties afterwards.
 ///
 /// Threads: any, several at a time.
@@ -20,11 +19,11 @@ public:
     /// @param device  Null: there is none to be had.
     /// @param system  Null: the host has no event system; the table's entry is null.
     /// @throws std::bad_alloc, std::system_error
-    [[nodiscard]] static Ref<Service> create(Ref<Device> device,
+    [[nodiscard]] static Ref<Service> create(Ref<ZorvaDevice> device,
                                              std::shared_ptr<EventSystem> system = nullptr);
 
     /// The device of the next starts; null for none.
-    void setDevice(Ref<Device> device);
+    void setDevice(Ref<ZorvaDevice> device);
     /// Whether the event system gives no clients.
     void refuseEventClients(bool isRefused);
 
@@ -38,7 +37,7 @@ private:
     static const ZorvaServiceTable kTable;
     static const ZorvaServiceTable kTableWithoutEvents;
 
-    Service(Ref<Device> device, std::shared_ptr<EventSystem> system);
+    Service(Ref<ZorvaDevice> device, std::shared_ptr<EventSystem> system);
     ~Service() = default;
 
     ZorvaDevice *createDevice();
@@ -46,11 +45,11 @@ private:
 
     Properties _properties;
     const std::shared_ptr<EventSystem> _system;
-    mutable Host::Mutex _lock;
-    Ref<Device> _device ZORVA_GUARDED_BY(_lock);
+    mutable Mutex _lock;
+    Ref<ZorvaDevice> _device ZORVA_GUARDED_BY(_lock);
     bool _areClientsRefused ZORVA_GUARDED_BY(_lock) = false;
     std::uint32_t _devicesCreated ZORVA_GUARDED_BY(_lock) = 0;
     std::uint32_t _clientsCreated ZORVA_GUARDED_BY(_lock) = 0;
 };
 
-} // namespace ZorvaTouch::Simulated
+} // namespace ZorvaTouch::Host
