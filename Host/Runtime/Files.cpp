@@ -48,8 +48,12 @@ template <typename Call> auto uninterrupted(const Call &call) {
     return result;
 }
 
-Descriptor openFile(const std::string &path, int flags) {
-    const int number = uninterrupted([&] { return ::open(path.c_str(), flags | O_CLOEXEC, 0666); });
+constexpr mode_t kForEverybody = 0666; ///< as far as the user lets new files be
+constexpr mode_t kForTheOwner = 0600;
+
+/// @param permissions  Of a file that is made, before the user's mask.
+Descriptor openFile(const std::string &path, int flags, mode_t permissions = 0) {
+    const int number = uninterrupted([&] { return ::open(path.c_str(), flags | O_CLOEXEC, permissions); });
     if (number < 0)
         throw FileFailure("open", errno);
     return Descriptor(number);
@@ -111,7 +115,8 @@ std::string folderOf(const std::string &path) {
 /// A new file that removes itself unless it is renamed.
 class TemporaryFile {
 public:
-    explicit TemporaryFile(const std::string &folder) : _descriptor(create(folder, _path)) {}
+    TemporaryFile(const std::string &folder, mode_t permissions)
+        : _descriptor(create(folder, permissions, _path)) {}
     TemporaryFile(const TemporaryFile &) = delete;
     TemporaryFile &operator=(const TemporaryFile &) = delete;
     ~TemporaryFile() {
@@ -135,12 +140,12 @@ public:
     }
 
 private:
-    static Descriptor create(const std::string &folder, std::string &path) {
+    static Descriptor create(const std::string &folder, mode_t permissions, std::string &path) {
         const std::string stem = folder + ".zorvatouch-" + std::to_string(::getpid()) + "-";
         for (int attempt = 0;; ++attempt) {
             path = stem + std::to_string(attempt);
             try {
-                return openFile(path, O_WRONLY | O_CREAT | O_EXCL);
+                return openFile(path, O_WRONLY | O_CREAT | O_EXCL, permissions);
             } catch (const FileFailure &failure) {
                 path.clear();
                 if (failure.code().value() != EEXIST || attempt == 100)
@@ -152,6 +157,25 @@ private:
     std::string _path;
     Descriptor _descriptor;
 };
+
+/// @param permissions  Nothing: as the user wants new files.
+void writeAndRename(const std::string &target, std::string_view contents, std::optional<mode_t> permissions) {
+    // Until it has its permissions nobody else reads what they may keep from others.
+    TemporaryFile file(folderOf(target), permissions ? kForTheOwner : kForEverybody);
+    file.write(contents, permissions);
+    file.renameTo(target);
+}
+
+/// @throws FileFailure  There is something that is no regular file.
+void requireRegularOrNothing(const std::string &path) {
+    struct stat status {};
+    if (::lstat(path.c_str(), &status) != 0 || S_ISREG(status.st_mode))
+        return; // what hinders us will say so when the file is made
+    if (S_ISDIR(status.st_mode))
+        throw FileFailure("replace", EISDIR);
+    throw FileFailure(S_ISLNK(status.st_mode) ? "replace a symbolic link" : "replace what is no regular file",
+                      EPERM);
+}
 
 } // namespace
 
@@ -167,10 +191,18 @@ void replaceFile(const std::string &path, std::string_view contents) {
         descriptor.close();
         return;
     }
-    const std::string target = resolveLinks(path);
-    TemporaryFile file(folderOf(target));
-    file.write(contents, old ? std::optional<mode_t>(old->st_mode & 07777) : std::nullopt);
-    file.renameTo(target);
+    writeAndRename(resolveLinks(path), contents,
+                   old ? std::optional<mode_t>(old->st_mode & 07777) : std::nullopt);
+}
+
+void replacePrivateFile(const std::string &path, std::string_view contents) {
+    requireRegularOrNothing(path);
+    writeAndRename(path, contents, kForTheOwner);
+}
+
+void requireReplaceable(const std::string &path) {
+    requireRegularOrNothing(path);
+    const TemporaryFile file(folderOf(path), kForTheOwner);
 }
 
 void writeStandard(StandardStream stream, std::string_view text) { writeAll(static_cast<int>(stream), text); }

@@ -14,7 +14,7 @@ public:
     FileFailure(const char *failedOperation, int errorNumber)
         : std::system_error(errorNumber, std::generic_category(), failedOperation),
           operation(failedOperation) {}
-    const char *operation; ///< a literal: "open", "read", "write", "rename"
+    const char *operation; ///< a literal: "open", "read", "write", "rename", "replace a symbolic link"
 };
 
 /// Descriptors of the standard streams.
@@ -34,6 +34,21 @@ enum class StandardStream : int { Input = 0, Output = 1, Error = 2 };
 /// device) is written to as it is.
 /// @throws FileFailure  The temporary file is gone then.
 void replaceFile(const std::string &path, std::string_view contents);
+
+/// The same for contents that are nobody else's business: the file is readable and writable for its owner and
+/// for nobody else, from its first byte on and whatever an older file's permissions were.
+///
+/// Only a regular file is replaced. What else is there is refused, a symbolic link too: the program may have
+/// more rights than whoever can put a link into that folder. One that gets there at the last moment is
+/// replaced, and what it points at stays as it is. The folders on the way to the file are whoever's who named
+/// it.
+/// @throws FileFailure  As above; EPERM for what is no regular file, EISDIR for a folder.
+void replacePrivateFile(const std::string &path, std::string_view contents);
+
+/// Whether `replacePrivateFile` can make the file, as far as that can be told beforehand. Leaves everything
+/// as it is.
+/// @throws FileFailure  What it would throw.
+void requireReplaceable(const std::string &path);
 
 /// Writes everything.
 /// @throws FileFailure

@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <fcntl.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -106,6 +107,68 @@ TEST_F(Files, ADeviceIsWrittenToAndStaysADevice) {
     replaceFile("/dev/null", "1");
     EXPECT_TRUE(std::filesystem::is_character_file("/dev/null"));
     EXPECT_EQ(failureOf([] { replaceFile("/dev/full", "1"); }), "write: No space left on device");
+}
+
+TEST_F(Files, APrivateFileIsItsOwnersAlone) {
+    const mode_t mask = ::umask(0);
+    replacePrivateFile(path("a"), "1");
+    ::umask(mask);
+    EXPECT_EQ(permissionsOf("a"), 0600u);
+    EXPECT_EQ(readFile(path("a")), "1");
+    EXPECT_EQ(fileCount(), 1u);
+}
+
+TEST_F(Files, APrivateFileIsItsOwnersWhateverTheMask) {
+    const mode_t mask = ::umask(0777);
+    replacePrivateFile(path("a"), "1");
+    ::umask(mask);
+    EXPECT_EQ(permissionsOf("a"), 0600u);
+}
+
+TEST_F(Files, APrivateFileReplacesOneThatOthersCouldRead) {
+    replaceFile(path("a"), "1");
+    ASSERT_EQ(::chmod(path("a").c_str(), 0644), 0);
+    const int reader = ::open(path("a").c_str(), O_RDONLY);
+    replacePrivateFile(path("a"), "2");
+    EXPECT_EQ(permissionsOf("a"), 0600u);
+    char old = 0;
+    EXPECT_EQ(::read(reader, &old, 1), 1); // who had it open reads what was there
+    EXPECT_EQ(old, '1');
+    ::close(reader);
+}
+
+TEST_F(Files, APrivateFileReplacesNothingButFiles) {
+    replaceFile(path("a"), "1");
+    ASSERT_EQ(::symlink("a", path("link").c_str()), 0);
+    ASSERT_EQ(::symlink("nowhere", path("loose").c_str()), 0);
+    ASSERT_EQ(::mkfifo(path("pipe").c_str(), 0600), 0);
+    EXPECT_EQ(failureOf([this] { replacePrivateFile(path("link"), "2"); }),
+              "replace a symbolic link: Operation not permitted");
+    EXPECT_EQ(failureOf([this] { replacePrivateFile(path("loose"), "2"); }),
+              "replace a symbolic link: Operation not permitted");
+    EXPECT_EQ(failureOf([this] { replacePrivateFile(path("pipe"), "2"); }),
+              "replace what is no regular file: Operation not permitted");
+    EXPECT_EQ(failureOf([] { replacePrivateFile("/dev/null", "2"); }),
+              "replace what is no regular file: Operation not permitted");
+    EXPECT_EQ(failureOf([this] { replacePrivateFile(_folder, "2"); }), "replace: Is a directory");
+    EXPECT_EQ(failureOf([this] { replacePrivateFile(path("no/a"), "2"); }),
+              "open a temporary file beside it: No such file or directory");
+    EXPECT_EQ(readFile(path("a")), "1");
+    EXPECT_EQ(fileCount(), 4u);
+}
+
+TEST_F(Files, WhatCannotBeReplacedIsToldBeforehand) {
+    replaceFile(path("a"), "1");
+    ASSERT_EQ(::symlink("a", path("link").c_str()), 0);
+    EXPECT_EQ(failureOf([this] { requireReplaceable(path("a")); }), "none");
+    EXPECT_EQ(failureOf([this] { requireReplaceable(path("new")); }), "none");
+    EXPECT_EQ(failureOf([this] { requireReplaceable(path("link")); }),
+              "replace a symbolic link: Operation not permitted");
+    EXPECT_EQ(failureOf([this] { requireReplaceable(_folder); }), "replace: Is a directory");
+    EXPECT_EQ(failureOf([this] { requireReplaceable(path("no/a")); }),
+              "open a temporary file beside it: No such file or directory");
+    EXPECT_EQ(readFile(path("a")), "1");
+    EXPECT_EQ(fileCount(), 2u);
 }
 
 TEST_F(Files, ABrokenPipeIsReported) {
