@@ -19,11 +19,7 @@ struct Accelerometer::Entries {
     static ZorvaDevice *createDevice(ZorvaService *) noexcept { return nullptr; }
     static ZorvaBoolean setProperty(ZorvaService *service, const char *key,
                                     const ZorvaValue *value) noexcept {
-        return guarded(false, [&] {
-            const bool isTaken =
-                key && std::string_view(key) == kReportInterval && readValue(value).asDouble();
-            return isTaken && of(service)._properties.setFromOther(key, value);
-        });
+        return guarded(ZorvaBoolean{0}, [&] { return of(service).setProperty(key, value); });
     }
 };
 
@@ -36,15 +32,33 @@ const ZorvaServiceTable Accelerometer::kTable{
     .setProperty = Entries::setProperty,
 };
 
-Ref<Accelerometer> Accelerometer::create(const std::shared_ptr<EventSystem> &system) {
-    auto accelerometer = Ref<Accelerometer>::adopt(new Accelerometer(system));
+Ref<Accelerometer> Accelerometer::create(const std::shared_ptr<EventSystem> &system,
+                                         std::weak_ptr<AccelerometerObserver> observer) {
+    auto accelerometer = Ref<Accelerometer>::adopt(new Accelerometer(system, std::move(observer)));
     system->add(accelerometer);
     return accelerometer;
 }
 
-Accelerometer::Accelerometer(const std::shared_ptr<EventSystem> &system)
+Accelerometer::Accelerometer(const std::shared_ptr<EventSystem> &system,
+                             std::weak_ptr<AccelerometerObserver> observer)
     : BoundaryObject(&kTable), _properties({{"PrimaryUsagePage", 0xFF00u}, {"PrimaryUsage", 3u}}),
-      _system(system) {}
+      _system(system), _observer(std::move(observer)) {}
+
+ZorvaBoolean Accelerometer::setProperty(const char *key, const ZorvaValue *value) {
+    const bool isOurs = key && std::string_view(key) == kReportInterval;
+    const PropertyValue read = isOurs ? readValue(value) : PropertyValue();
+    const double *const interval = read.asDouble();
+    if (!interval || !_properties.setFromOther(key, value))
+        return false;
+    if (const auto observer = _observer.lock())
+        observer->onReportInterval(*interval);
+    return true;
+}
+
+void Accelerometer::tellListening(bool isListenedTo) const noexcept {
+    if (const auto observer = _observer.lock())
+        observer->onListening(isListenedTo);
+}
 
 void Accelerometer::deliver(float x, float y, float z, std::uint64_t timestamp) {
     deliver(HostEvent::createAccelerometer(timestamp, {x, y, z}, 0));
@@ -68,6 +82,11 @@ void Accelerometer::unplug() {
 void Accelerometer::plug() {
     if (const auto system = _system.lock())
         system->setPlugged(*this, true);
+}
+
+void Accelerometer::withdraw() {
+    if (const auto system = _system.lock())
+        system->remove(*this);
 }
 
 std::optional<double> Accelerometer::reportInterval() const {

@@ -16,17 +16,40 @@ EventSystem::~EventSystem() = default;
 // --- Services ----------------------------------------------------------------------------------------------
 
 void EventSystem::add(const Ref<Accelerometer> &accelerometer) {
+    {
+        MutexLock lock(_lock);
+        _services.push_back({.accelerometer = accelerometer});
+        updateSources();
+    }
+    tellListening();
+}
+
+void EventSystem::remove(const Accelerometer &accelerometer) {
+    Ref<Accelerometer> removed; // released without the lock
     MutexLock lock(_lock);
-    _services.push_back({accelerometer, true});
+    Service *const service = find(accelerometer);
+    if (!service)
+        return;
+    removed = service->accelerometer;
+    _services.erase(_services.begin() + (service - _services.data()));
     updateSources();
 }
 
 void EventSystem::setPlugged(const Accelerometer &accelerometer, bool isPlugged) {
-    MutexLock lock(_lock);
-    for (Service &service : _services)
-        if (service.accelerometer.get() == &accelerometer)
-            service.isPlugged = isPlugged;
-    updateSources();
+    {
+        MutexLock lock(_lock);
+        if (Service *const service = find(accelerometer))
+            service->isPlugged = isPlugged;
+        updateSources();
+    }
+    tellListening();
+}
+
+EventSystem::Service *EventSystem::find(const Accelerometer &accelerometer) {
+    const auto service = std::find_if(_services.begin(), _services.end(), [&](const Service &candidate) {
+        return candidate.accelerometer.get() == &accelerometer;
+    });
+    return service == _services.end() ? nullptr : &*service;
 }
 
 bool EventSystem::isMatch(const Client &client, const Service &service) {
@@ -52,14 +75,51 @@ void EventSystem::updateSources() {
         updateSource(client);
 }
 
+// --- Who listens -------------------------------------------------------------------------------------------
+
+bool EventSystem::isListenedTo(const Service &service) const {
+    return std::any_of(_clients.begin(), _clients.end(), [&](const auto &entry) {
+        return entry.second.inbox.isConnected() && isMatch(entry.second, service);
+    });
+}
+
+EventSystem::Service *EventSystem::nextToTell() {
+    for (Service &service : _services)
+        if (!service.isTelling && service.isToldListened != isListenedTo(service))
+            return &service;
+    return nullptr;
+}
+
+bool EventSystem::tellOne() noexcept {
+    Ref<Accelerometer> accelerometer;
+    bool isListened;
+    {
+        MutexLock lock(_lock);
+        Service *const service = nextToTell();
+        if (!service)
+            return false;
+        service->isTelling = true;
+        isListened = service->isToldListened = !service->isToldListened;
+        accelerometer = service->accelerometer;
+    }
+    accelerometer->tellListening(isListened);
+    MutexLock lock(_lock);
+    if (Service *const service = find(*accelerometer.get()))
+        service->isTelling = false;
+    return true;
+}
+
+void EventSystem::tellListening() noexcept {
+    while (tellOne())
+        ;
+}
+
 // --- Events ------------------------------------------------------------------------------------------------
 
 void EventSystem::publish(const Accelerometer &from, const Ref<const ZorvaEvent> &event) {
     MutexLock lock(_lock);
-    const auto service = std::find_if(_services.begin(), _services.end(), [&](const Service &candidate) {
-        return candidate.accelerometer.get() == &from;
-    });
-    if (service == _services.end())
+    const Service *const service = find(from);
+    if (!service)
         return;
     for (auto &[id, client] : _clients)
         if (client.inbox.isConnected() && isMatch(client, *service) && !client.inbox.push(event))
@@ -143,10 +203,13 @@ void EventSystem::remove(ClientId id) noexcept {
 }
 
 void EventSystem::setMatching(ClientId id, PropertyValue properties) {
-    MutexLock lock(_lock);
-    Client &client = _clients.at(id);
-    client.matching = std::move(properties);
-    updateSource(client);
+    {
+        MutexLock lock(_lock);
+        Client &client = _clients.at(id);
+        client.matching = std::move(properties);
+        updateSource(client);
+    }
+    tellListening();
 }
 
 std::size_t EventSystem::copyServices(ClientId id, std::span<ZorvaService *> services) {
@@ -176,21 +239,28 @@ void EventSystem::stopListening(ClientId id, ZorvaEventClientCallback function, 
 
 void EventSystem::schedule(EventClient &handle, ZorvaRunLoop *loop, const char *mode) {
     leaveLoop(handle.id());
-    MutexLock lock(_lock);
-    Client &client = _clients.at(handle.id());
-    client.inbox.schedule(loop, mode, EventClient::serve, &handle);
-    client.scheduled = handle.ref();
-    updateSource(client);
+    {
+        MutexLock lock(_lock);
+        Client &client = _clients.at(handle.id());
+        client.inbox.schedule(loop, mode, EventClient::serve, &handle);
+        client.scheduled = handle.ref();
+        updateSource(client);
+    }
+    tellListening();
 }
 
 void EventSystem::unschedule(ClientId id, const ZorvaRunLoop *loop, const char *mode) noexcept {
+    const std::shared_ptr<EventSystem> self =
+        weak_from_this().lock(); // the client may go, and be its last owner
     bool isPlace;
     {
         MutexLock lock(_lock);
         isPlace = _clients.find(id)->second.inbox.isScheduledOn(loop, mode);
     }
-    if (isPlace)
-        leaveLoop(id);
+    if (!isPlace)
+        return;
+    leaveLoop(id);
+    tellListening();
 }
 
 void EventSystem::leaveLoop(ClientId id) noexcept {

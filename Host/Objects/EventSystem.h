@@ -72,13 +72,16 @@ private:
     };
     struct Service {
         Ref<Accelerometer> accelerometer;
-        bool isPlugged;
+        bool isPlugged = true;
+        bool isToldListened = false; ///< what its observer knows: whether somebody listens
+        bool isTelling = false;      ///< a thread is at that; it sees to what changes meanwhile
     };
 
     EventSystem();
 
     // For services.
     void add(const Ref<Accelerometer> &accelerometer);
+    void remove(const Accelerometer &accelerometer);
     void setPlugged(const Accelerometer &accelerometer, bool isPlugged);
     void publish(const Accelerometer &from, const Ref<const ZorvaEvent> &event);
 
@@ -96,6 +99,11 @@ private:
     [[nodiscard]] ClientId addClient();
     [[nodiscard]] static bool isMatch(const Client &client, const Service &service);
     [[nodiscard]] bool hasMatch(const Client &client) const ZORVA_REQUIRES(_lock);
+    [[nodiscard]] Service *find(const Accelerometer &accelerometer) ZORVA_REQUIRES(_lock);
+    [[nodiscard]] bool isListenedTo(const Service &service) const ZORVA_REQUIRES(_lock);
+    [[nodiscard]] Service *nextToTell() ZORVA_REQUIRES(_lock);
+    [[nodiscard]] bool tellOne() noexcept;
+    void tellListening() noexcept;
     void updateSource(Client &client) ZORVA_REQUIRES(_lock);
     void updateSources() ZORVA_REQUIRES(_lock);
     [[nodiscard]] bool mustWaitFor(const std::map<ClientId, std::uint64_t> &delivered) const
