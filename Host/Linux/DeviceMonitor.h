@@ -25,7 +25,7 @@ public:
     /// @param listener  Borrowed; outlives this.
     /// @throws std::system_error  There is no monitor to be had.
     /// @throws std::bad_alloc
-    DeviceMonitor(std::vector<HidId> wanted, DeviceListener &listener,
+    DeviceMonitor(DeviceFilter wanted, DeviceListener &listener,
                   MonitorSource source = detectMonitorSource());
     ~DeviceMonitor();
     DeviceMonitor(const DeviceMonitor &) = delete;

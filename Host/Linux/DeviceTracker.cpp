@@ -1,15 +1,25 @@
 #include "Host/Linux/DeviceTracker.h"
 
 #include <algorithm>
+#include <filesystem>
+#include <system_error>
 #include <utility>
 
 namespace ZorvaTouch::Linux {
 
-DeviceTracker::DeviceTracker(std::vector<HidId> wanted, DeviceListener &listener)
+bool DeviceFilter::matches(const DeviceIdentity &device) const {
+    const auto isDevice = [&](const std::string &node) {
+        std::error_code error;
+        return node == device.devnode || std::filesystem::canonical(node, error) == device.devnode;
+    };
+    return std::ranges::find(ids, device.id) != ids.end() || std::ranges::any_of(nodes, isDevice);
+}
+
+DeviceTracker::DeviceTracker(DeviceFilter wanted, DeviceListener &listener)
     : _wanted(std::move(wanted)), _listener(listener) {}
 
 void DeviceTracker::added(const DeviceIdentity &device, bool isReady) {
-    if (!isWanted(device))
+    if (!_wanted.matches(device))
         return;
     auto entry = find(device.syspath);
     if (entry == _entries.end())
@@ -46,10 +56,6 @@ void DeviceTracker::replaceAll(const std::vector<DeviceIdentity> &present) {
         removed(syspath);
     for (const DeviceIdentity &device : present)
         added(device, true);
-}
-
-bool DeviceTracker::isWanted(const DeviceIdentity &device) const {
-    return std::ranges::find(_wanted, device.id) != _wanted.end();
 }
 
 std::vector<DeviceTracker::Entry>::iterator DeviceTracker::find(std::string_view syspath) {

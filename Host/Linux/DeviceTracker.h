@@ -17,7 +17,15 @@ public:
     virtual void onRemoved(const DeviceIdentity &device) = 0;
 };
 
-/// Keeps track of the devices of some makes, from what the system says happened to any device.
+/// Which devices are wanted: those of some makes, and those under some paths.
+struct DeviceFilter {
+    std::vector<HidId> ids;
+    std::vector<std::string> nodes; ///< "/dev/hidraw0", or links to such; followed when a device comes
+
+    [[nodiscard]] bool matches(const DeviceIdentity &device) const;
+};
+
+/// Keeps track of the devices that are wanted, from what the system says happened to any device.
 ///
 /// The kernel announces a node before the device's driver has finished with it, and loses reports that come
 /// in between. So a node may be there and not be told of yet.
@@ -26,7 +34,7 @@ public:
 class DeviceTracker {
 public:
     /// @param listener  Borrowed; outlives this.
-    DeviceTracker(std::vector<HidId> wanted, DeviceListener &listener);
+    DeviceTracker(DeviceFilter wanted, DeviceListener &listener);
 
     /// A node is there. One that is known is left as it is, but for becoming ready.
     /// @param isReady  Whether its reports get through already.
@@ -45,11 +53,10 @@ private:
         bool isTold = false;
     };
 
-    [[nodiscard]] bool isWanted(const DeviceIdentity &device) const;
     [[nodiscard]] std::vector<Entry>::iterator find(std::string_view syspath);
     void tell(Entry &entry);
 
-    const std::vector<HidId> _wanted;
+    const DeviceFilter _wanted;
     DeviceListener &_listener;
     std::vector<Entry> _entries;
 };

@@ -190,9 +190,13 @@ void HidrawDevice::leaveLoop() noexcept {
     // Released in the opposite order, after the lock: the loop, then perhaps the device itself.
     Ref<HidrawDevice> self;
     Ref<ZorvaRunLoop> loop;
-    MutexLock lock(_lock);
-    loop = _source.unschedule();
-    self = std::move(_scheduled);
+    {
+        MutexLock lock(_lock);
+        loop = _source.unschedule();
+        self = std::move(_scheduled);
+    }
+    if (self && _observer)
+        _observer->onUnscheduled();
 }
 
 // --- Answers -----------------------------------------------------------------------------------------------

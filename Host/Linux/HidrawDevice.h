@@ -30,6 +30,9 @@ public:
     virtual void onGone(const SystemFailure &reason) noexcept = 0;
     /// Opening failed, or one read did.
     virtual void onFailure(const SystemFailure &failure) noexcept = 0;
+    /// The device was taken off its run loop: whoever had scheduled it, or scheduled it anew, listens no
+    /// more.
+    virtual void onUnscheduled() noexcept {}
 };
 
 /// What has happened to a device so far.

@@ -2,6 +2,7 @@
 
 #include "Host/Linux/UinputDevice.h"
 
+#include <fcntl.h>
 #include <linux/input.h>
 
 #include <algorithm>
@@ -35,6 +36,11 @@ std::string textOf(const SystemFailure &failure, const std::string &path) {
 
 KeyboardFailure::KeyboardFailure(const SystemFailure &failed, const std::string &path)
     : std::runtime_error(textOf(failed, path)), failure(failed) {}
+
+std::optional<std::string> findKeyboardProblem(const std::string &path) {
+    const UniqueFd uinput(::open(path.c_str(), O_WRONLY | O_NONBLOCK | O_CLOEXEC));
+    return uinput ? std::nullopt : std::optional(textOf({"open", errno}, path));
+}
 
 std::unique_ptr<VirtualKeyboard> VirtualKeyboard::create(const std::vector<std::uint16_t> &codes,
                                                          const std::string &path) {

@@ -28,6 +28,10 @@ public:
     const SystemFailure failure;
 };
 
+/// Why no keyboard can be made there, if that can be told without making one: the text of a KeyboardFailure.
+/// @throws std::bad_alloc
+[[nodiscard]] std::optional<std::string> findKeyboardProblem(const std::string &path = kUinputPath);
+
 /// A keyboard that the system takes for a real one. Keys that are held repeat, as fast as the system's
 /// keyboards do. In the end it releases what is still down: the kernel would not tell.
 ///

@@ -61,7 +61,7 @@ protected:
     }
     void listen(MonitorSource source) {
         DeviceListener &self = *this;
-        monitor = std::make_unique<DeviceMonitor>(std::vector<HidId>{{0x1234, 0xABCD}}, self, source);
+        monitor = std::make_unique<DeviceMonitor>(DeviceFilter{{{0x1234, 0xABCD}}, {}}, self, source);
     }
 
     const std::unique_ptr<UMockdevTestbed, void (*)(void *)> testbed{::umockdev_testbed_new(),

@@ -22,7 +22,7 @@ protected:
 };
 
 TEST_P(DeviceMonitors, FindNothingWhereNothingIsWanted) {
-    DeviceMonitor monitor({}, listener, GetParam());
+    DeviceMonitor monitor({{}, {}}, listener, GetParam());
     EXPECT_EQ(monitor.source(), GetParam());
     monitor.scan();
     monitor.receive();
@@ -30,7 +30,7 @@ TEST_P(DeviceMonitors, FindNothingWhereNothingIsWanted) {
 }
 
 TEST_P(DeviceMonitors, HaveADescriptorThatIsNotInheritedAndNeverBlocks) {
-    const DeviceMonitor monitor({{0x1234, 0xABCD}}, listener, GetParam());
+    const DeviceMonitor monitor({{{0x1234, 0xABCD}}, {}}, listener, GetParam());
     EXPECT_EQ(::fcntl(monitor.descriptor(), F_GETFD) & FD_CLOEXEC, FD_CLOEXEC);
     EXPECT_EQ(::fcntl(monitor.descriptor(), F_GETFL) & O_NONBLOCK, O_NONBLOCK);
     pollfd set{.fd = monitor.descriptor(), .events = POLLIN, .revents = 0};

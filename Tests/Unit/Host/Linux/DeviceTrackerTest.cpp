@@ -2,6 +2,7 @@
 
 #include <gmock/gmock.h>
 
+#include <filesystem>
 #include <string>
 #include <vector>
 
@@ -82,7 +83,7 @@ protected:
     std::vector<std::string> takeTold() { return std::exchange(told, {}); }
 
     std::vector<std::string> told;
-    DeviceTracker tracker{{{1, 2}, {1, 3}}, *this};
+    DeviceTracker tracker{{{{1, 2}, {1, 3}}, {"/dev/hidraw7"}}, *this};
 
 private:
     void onAdded(const DeviceIdentity &device) override { told.push_back("+" + device.devnode); }
@@ -97,6 +98,24 @@ TEST_F(DeviceTracking, TellsOfTheMakesThatAreWanted) {
     for (int number = 0; number < 4; ++number)
         tracker.removed(node(number).syspath);
     EXPECT_THAT(told, ElementsAre("+/dev/hidraw0", "+/dev/hidraw1", "-/dev/hidraw0", "-/dev/hidraw1"));
+}
+
+TEST_F(DeviceTracking, TellsOfTheNodesThatAreWantedWhateverTheirMake) {
+    tracker.added(node(7, {2, 2}), true);
+    tracker.added(node(8, {2, 2}), true);
+    EXPECT_THAT(told, ElementsAre("+/dev/hidraw7"));
+}
+
+TEST(DeviceFilters, FollowLinksWhenTheDeviceComes) {
+    const std::filesystem::path link = testing::TempDir() + "zorva-link";
+    std::filesystem::remove(link);
+    const DeviceFilter filter{{}, {link}};
+    DeviceIdentity device;
+    device.devnode = "/dev/null";
+    EXPECT_FALSE(filter.matches(device)) << "there is no such link yet";
+    std::filesystem::create_symlink("/dev/null", link);
+    EXPECT_TRUE(filter.matches(device));
+    std::filesystem::remove(link);
 }
 
 TEST_F(DeviceTracking, TellsOnce) {
