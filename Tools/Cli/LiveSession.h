@@ -10,8 +10,8 @@
 #include "Tools/Cli/Environment.h"
 #include "Tools/Cli/EventInbox.h"
 #include "Tools/Cli/LiveSource.h"
-#include "Tools/Cli/SessionPlatform.h"
 #include "Tools/Hosting/HostedService.h"
+#include "Tools/Hosting/SessionPlatform.h"
 
 #include <cstdint>
 #include <memory>

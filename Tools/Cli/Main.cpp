@@ -4,14 +4,13 @@
 #include "Host/Runtime/StopSignals.h"
 #include "Host/Runtime/Terminal.h"
 #include "Tools/Cli/Cli.h"
+#include "Tools/Hosting/ProgramFolder.h"
 
 #include <cstdlib>
-#include <filesystem>
 #include <functional>
 #include <memory>
 #include <string>
 #include <string_view>
-#include <system_error>
 #include <utility>
 #include <vector>
 
@@ -33,24 +32,12 @@ std::string_view variable(const char *name) {
     return value ? value : "";
 }
 
-/// Whether standard output is a terminal that understands more than text.
-bool isScreen() { return Host::isTerminal(Host::StandardStream::Output) && variable("TERM") != "dumb"; }
-
-bool usesColour() { return isScreen() && variable("NO_COLOR").empty(); }
-
 std::size_t screenColumns() {
     constexpr std::size_t kUsual = 80;
-    if (!isScreen())
+    if (!Host::isScreen(Host::StandardStream::Output))
         return 0;
     const std::size_t columns = Host::terminalColumns(Host::StandardStream::Output);
     return columns > 0 ? columns : kUsual;
-}
-
-/// The plug-in's file as it lies from the program's own folder, built and installed alike.
-std::string plugInBesideProgram() {
-    std::error_code error;
-    const auto program = std::filesystem::read_symlink("/proc/self/exe", error);
-    return (program.parent_path() / ZORVA_PLUGIN_FROM_PROGRAM).lexically_normal().string();
 }
 
 /// Where programs keep what outlives a run, as freedesktop.org has it; the current folder without a home.
@@ -79,14 +66,14 @@ int main(int argc, char **argv) {
         .errorOutput = {errorOutput, "standard error"},
         .clock = clock,
         .openLogs = [](Ports::LogLevel minimum) { return std::make_unique<Host::SpdlogLogs>(minimum); },
-        .usesColour = usesColour(),
+        .usesColour = Host::showsColours(Host::StandardStream::Output),
         .showsProgress = Host::isTerminal(Host::StandardStream::Error),
         .screenColumns = screenColumns,
         .watchStop =
             [](std::function<void()> onStop) {
                 return std::make_shared<Host::StopSignals>(std::move(onStop));
             },
-        .plugIn = plugInBesideProgram(),
+        .plugIn = Tools::besideProgram(ZORVA_PLUGIN_FROM_PROGRAM),
         .stateFolder = stateFolder(),
     };
     return Tools::runCli(argumentsOf(argc, argv), environment);

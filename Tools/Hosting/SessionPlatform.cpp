@@ -1,4 +1,4 @@
-#include "Tools/Cli/SessionPlatform.h"
+#include "Tools/Hosting/SessionPlatform.h"
 
 #include <utility>
 
@@ -33,7 +33,7 @@ private:
     std::shared_ptr<std::latch> _isServing; ///< null once told
 };
 
-SessionPlatform::SessionPlatform(std::unique_ptr<Ports::LogProvider> logs, Ports::Clock *clock)
+SessionPlatform::SessionPlatform(std::shared_ptr<Ports::LogProvider> logs, Ports::Clock *clock)
     : _logs(std::move(logs)), _system(Host::processPlatform()), _clock(clock ? *clock : _system.clock()) {
     Host::setProcessPlatform(this);
 }

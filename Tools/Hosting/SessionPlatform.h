@@ -14,7 +14,7 @@ class SessionPlatform final : public Host::Platform {
 public:
     /// @param logs   For the plug-in.
     /// @param clock  Borrowed; null: the system's.
-    SessionPlatform(std::unique_ptr<Ports::LogProvider> logs, Ports::Clock *clock);
+    SessionPlatform(std::shared_ptr<Ports::LogProvider> logs, Ports::Clock *clock);
     ~SessionPlatform() override;
     SessionPlatform(const SessionPlatform &) = delete;
     SessionPlatform &operator=(const SessionPlatform &) = delete;
@@ -35,7 +35,7 @@ public:
 private:
     class WatchedRunLoop;
 
-    const std::unique_ptr<Ports::LogProvider> _logs;
+    const std::shared_ptr<Ports::LogProvider> _logs;
     Host::Platform &_system;
     Ports::Clock &_clock;
     std::mutex _lock;
