@@ -1,0 +1,110 @@
+#include "Tools/Daemon/RecordingSaver.h"
+
+#include "Host/Runtime/Files.h"
+
+#include <gtest/gtest.h>
+
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <filesystem>
+#include <string>
+
+namespace ZorvaTouch::Tools {
+namespace {
+
+constexpr const char *kTwoReports =
+    R"({"Version":2,"Frames":[{"Type":"State","Timestamp":1,"Key":"Algs.ActivationThreshold","Value":200.0},)"
+    R"({"Type":"InputReport","Timestamp":2,"Data":"01 ab "},{"Type":"InputReport","Timestamp":3,"Data":""}]})";
+
+class RecordingSaver : public ::testing::Test {
+protected:
+    void SetUp() override {
+        std::string pattern = (std::filesystem::temp_directory_path() / "zorvatouch-test-XXXXXX").string();
+        ASSERT_NE(::mkdtemp(pattern.data()), nullptr);
+        _folder = pattern;
+    }
+    void TearDown() override { std::filesystem::remove_all(_folder); }
+
+    [[nodiscard]] std::string path(const std::string &name) const { return _folder + "/" + name; }
+
+    /// What is said about saving; the folder's name is "@".
+    [[nodiscard]] std::string problemWith(const std::string &file, std::string_view text) const {
+        try {
+            static_cast<void>(saveRecordingFile(file, text));
+            return {};
+        } catch (const SavingError &error) {
+            std::string message = error.what();
+            if (message.starts_with(_folder))
+                message.replace(0, _folder.size(), "@");
+            return message;
+        }
+    }
+
+    std::string _folder;
+};
+
+TEST_F(RecordingSaver, CountsTheReports) {
+    EXPECT_EQ(saveRecordingFile(path("a.json"), kTwoReports), 2u);
+    EXPECT_EQ(Host::readFile(path("a.json")), kTwoReports);
+    EXPECT_EQ(saveRecordingFile(path("a.json"), R"({"Version":2,"Frames":[]})"), 0u);
+}
+
+TEST_F(RecordingSaver, NobodyElseReadsIt) {
+    Host::replaceFile(path("a.json"), "older");
+    ASSERT_EQ(::chmod(path("a.json").c_str(), 0644), 0);
+    EXPECT_EQ(saveRecordingFile(path("a.json"), kTwoReports), 2u);
+    struct stat status {};
+    ASSERT_EQ(::stat(path("a.json").c_str(), &status), 0);
+    EXPECT_EQ(status.st_mode & 07777, 0600u);
+}
+
+TEST_F(RecordingSaver, WhatIsNoRecordingReplacesNothing) {
+    Host::replaceFile(path("a.json"), "older");
+    EXPECT_EQ(problemWith(path("a.json"), "{}"),
+              "@/a.json: not written, since the service's recording is none: "
+              "migrateSerializedContainer failed: invalid version");
+    EXPECT_EQ(Host::readFile(path("a.json")), "older");
+}
+
+TEST_F(RecordingSaver, FailuresAreOneLine) {
+    EXPECT_EQ(problemWith(path("no/a.json"), kTwoReports),
+              "@/no/a.json: cannot open a temporary file beside it: No such file or directory");
+    EXPECT_EQ(problemWith(_folder, kTwoReports), "@: cannot replace: Is a directory");
+    EXPECT_EQ(problemWith("/dev/full", kTwoReports),
+              "/dev/full: cannot replace what is no regular file: Operation not permitted");
+}
+
+TEST_F(RecordingSaver, ALinkIsNotFollowed) {
+    Host::replaceFile(path("precious"), "x");
+    ASSERT_EQ(::symlink("precious", path("a.json").c_str()), 0);
+    EXPECT_EQ(problemWith(path("a.json"), kTwoReports),
+              "@/a.json: cannot replace a symbolic link: Operation not permitted");
+    EXPECT_EQ(Host::readFile(path("precious")), "x");
+}
+
+TEST_F(RecordingSaver, WhatCannotBeSavedIsToldAtTheStart) {
+    EXPECT_NO_THROW(requireSavable(path("a.json")));
+    try {
+        requireSavable(path("no/a.json"));
+        FAIL();
+    } catch (const SavingError &error) {
+        EXPECT_EQ(error.what(),
+                  path("no/a.json") + ": cannot open a temporary file beside it: No such file or directory");
+    }
+    EXPECT_TRUE(std::filesystem::is_empty(_folder));
+}
+
+TEST(RecordingNames, OfFurtherSurfacesAreNumbered) {
+    EXPECT_EQ(fileOfSurface("touch.json", 1), "touch.json");
+    EXPECT_EQ(fileOfSurface("touch.json", 2), "touch-2.json");
+    EXPECT_EQ(fileOfSurface("/a.b/touch.x.json", 10), "/a.b/touch.x-10.json");
+    EXPECT_EQ(fileOfSurface("/a.b/touch", 2), "/a.b/touch-2");
+    EXPECT_EQ(fileOfSurface("touch", 3), "touch-3");
+    EXPECT_EQ(fileOfSurface(".touch", 2), ".touch-2");
+    EXPECT_EQ(fileOfSurface("a/.touch", 2), "a/.touch-2");
+    EXPECT_EQ(fileOfSurface("touch.", 2), "touch-2.");
+}
+
+} // namespace
+} // namespace ZorvaTouch::Tools

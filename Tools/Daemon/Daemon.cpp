@@ -1,0 +1,209 @@
+#include "Tools/Daemon/Daemon.h"
+
+#include "Host/Linux/RealTime.h"
+#include "Host/Linux/StartUpCode.h"
+#include "Shared/LogNames.h"
+#include "Tools/Daemon/DaemonChoices.h"
+#include "Tools/Daemon/KeyLines.h"
+#include "Tools/Daemon/PlugInLogs.h"
+#include "Tools/Daemon/RecordingSaver.h"
+
+#include <array>
+#include <csignal>
+#include <stdexcept>
+#include <system_error>
+#include <utility>
+
+namespace ZorvaTouch::Tools {
+namespace {
+
+constexpr int kKeyThreadPriority = 63; // as the plug-in's input threads: who hands over must not wait
+constexpr std::array kEndSignals{SIGTERM, SIGINT, SIGHUP};
+constexpr int kSaveSignal = SIGUSR1;
+
+Linux::RateLimitedLogs::Scope scopeFor(Ports::LogLevel level) {
+    return level == Ports::LogLevel::Debug ? Linux::RateLimitedLogs::Scope::ExceptDebug
+                                           : Linux::RateLimitedLogs::Scope::Everything;
+}
+
+std::string droppedLine(bool isJson, std::uint64_t lines) {
+    return isJson ? lineOf(DroppedNews{.lines = lines}) : droppedKeyLine(lines);
+}
+
+} // namespace
+
+// --- Putting together --------------------------------------------------------------------------------------
+
+Daemon::Daemon(const DaemonOptions &options, DaemonSurroundings surroundings)
+    : _options(options), _surroundings(std::move(surroundings)), _logs(makeLogs()),
+      _platform(std::make_unique<PlugInLogs>(_logs), &_surroundings.clock), _log(*_logs, "Daemon"),
+      _stream(
+          _surroundings.output,
+          [isJson = options.showsEvents](std::uint64_t lines) { return droppedLine(isJson, lines); },
+          _logs->openLog(kLogSubsystem, "Events")),
+      _listener(makeListener()), _keyQueue("zorva-keys", realTimePriority()),
+      _keyboard(options.sendsKeys ? _surroundings.keyboard : nullptr, *_listener, DaemonLog(*_logs, "Keys")),
+      _events(Host::EventSystem::create()),
+      _recordings(options.saveFile, *_listener, DaemonLog(*_logs, "Recordings")),
+      _surfaces({.plugIn = _surroundings.plugIn,
+                 .events = _events,
+                 .keyQueue = _keyQueue,
+                 .keyboard = _keyboard,
+                 .keyMap = options.keys,
+                 .listener = *_listener,
+                 .loop = _loop,
+                 .log = DaemonLog(*_logs, "Surfaces")},
+                _surroundings.finder, _surroundings.clock,
+                {.onComing = [this](const SurfaceName &name) { _recordings.expect(name); },
+                 .onEnding = [this](const SurfaceName &name,
+                                    const Surface &surface) { _recordings.save(name, surface); }}) {
+    if (_options.saveFile)
+        requireSavable(*_options.saveFile); // rather now than when it is too late
+    checkPlugIn();
+    watchAccelerometers();
+    startSimulations();
+    watchDevices();
+    watchSleep();
+}
+
+Daemon::~Daemon() {
+    _surfaces.closeAll();
+    _stream.finish();
+}
+
+std::shared_ptr<Linux::RateLimitedLogs> Daemon::makeLogs() {
+    watchSignals(); // before any thread
+    return std::make_shared<Linux::RateLimitedLogs>(
+        _surroundings.logs, _surroundings.clock, [this] { _loop.post([this] { flushLogsWhenDue(); }); },
+        scopeFor(_options.logLevel));
+}
+
+std::unique_ptr<DaemonListener> Daemon::makeListener() {
+    std::vector<std::unique_ptr<DaemonListener>> listeners;
+    listeners.push_back(std::make_unique<LogListener>(DaemonLog(*_logs, "Surfaces")));
+    if (_options.showsEvents)
+        listeners.push_back(std::make_unique<JsonListener>(_stream, _surroundings.clock));
+    else
+        listeners.push_back(std::make_unique<ScreenListener>(
+            _stream, _surroundings.clock, _surroundings.usesColour, _options.devices.size() > 1));
+    return std::make_unique<ListenerGroup>(std::move(listeners));
+}
+
+int Daemon::realTimePriority() const {
+    if (const auto refusal = Linux::tryRoundRobin(kKeyThreadPriority)) {
+        _log.notice({refusal->line});
+        return 0;
+    }
+    return kKeyThreadPriority;
+}
+
+/// Rather now than with the first surface.
+void Daemon::checkPlugIn() {
+    const HostedService service(_surroundings.plugIn);
+    _log.notice({_surroundings.plugIn, ", version ", service.version()});
+}
+
+// --- What it hears -----------------------------------------------------------------------------------------
+
+void Daemon::watchSignals() {
+    for (const int signal : kEndSignals)
+        _watches.push_back(_loop.onSignal(signal, [this] { _loop.quit(); }));
+    _watches.push_back(_loop.onSignal(kSaveSignal, [this] {
+        _surfaces.forEach(
+            [this](const SurfaceName &name, const Surface &surface) { _recordings.save(name, surface); });
+    }));
+}
+
+void Daemon::watchAccelerometers() {
+    if (_options.accel.choice == AccelOption::Choice::None)
+        return;
+    _accelHub.emplace(_events, accelChoiceOf(_options.accel),
+                      _logs->openLog(kLogSubsystem, Linux::kLogCategoryAccelerometer),
+                      [this] { _surfaces.reschedule(); });
+    _accelMonitor.emplace(*_accelHub);
+    _watches.push_back(_loop.watch(_accelMonitor->descriptor(), [this] {
+        _accelMonitor->receive();
+        noteAccelerometer();
+    }));
+    _accelMonitor->scan();
+    noteAccelerometer();
+}
+
+void Daemon::noteAccelerometer() {
+    const auto &chosen = _accelHub->chosen();
+    const std::string now = !chosen ? std::string() : chosen->name.empty() ? chosen->devnode : chosen->name;
+    if (now == _accelerometer)
+        return;
+    if (!_accelerometer.empty())
+        _listener->onAccelerometer(_accelerometer, false);
+    if (!now.empty())
+        _listener->onAccelerometer(now, true);
+    _accelerometer = now;
+}
+
+void Daemon::watchDevices() {
+    const Linux::DeviceFilter filter = deviceFilterOf(_options);
+    if (filter.ids.empty() && filter.nodes.empty())
+        return;
+    _deviceMonitor.emplace(filter, _surfaces);
+    _watches.push_back(_loop.watch(_deviceMonitor->descriptor(), [this] {
+        // Early at a system's start there may be no uinput yet.
+        _keyQueue.submit([this] { _keyboard.plug(); });
+        _deviceMonitor->receive();
+    }));
+    _deviceMonitor->scan();
+    if (_surfaces.count() == 0)
+        _log.notice({"no surface is there yet"});
+}
+
+void Daemon::watchSleep() {
+    _sleepWatch.emplace(
+        _loop, *_logs,
+        [this] {
+            _surfaces.suspend();
+            _listener->onSleep(true);
+        },
+        [this] { _listener->onSleep(false); });
+}
+
+void Daemon::flushLogsWhenDue() {
+    _logs->flush();
+    const auto due = _logs->nextDue();
+    _logFlush = due ? _loop.after(*due, [this] { flushLogsWhenDue(); }) : Linux::LoopWatch();
+}
+
+// --- Simulations -------------------------------------------------------------------------------------------
+
+void Daemon::startSimulations() {
+    for (const DeviceOption &device : _options.devices)
+        if (const auto *const finger = std::get_if<SimulatedFinger>(&device)) {
+            SimulatedSurface &simulation = _simulations.emplace_back(*finger, simulatedAccelerometer(), _loop,
+                                                                     [this] { finishSimulation(); });
+            _surfaces.add(simulation.name(), simulation.maker());
+            simulation.play();
+            ++_playing;
+        }
+}
+
+/// The finger shakes the machine, too, unless there is a real one to be shaken.
+Ref<Host::Accelerometer> Daemon::simulatedAccelerometer() {
+    return _accelHub && _accelerometer.empty() ? Host::Accelerometer::create(_events)
+                                               : Ref<Host::Accelerometer>();
+}
+
+/// When all have been played and nothing else is there to wait for, that was it.
+void Daemon::finishSimulation() {
+    if (--_playing == 0 && !_deviceMonitor)
+        _loop.quit();
+}
+
+// --- Serving -----------------------------------------------------------------------------------------------
+
+void Daemon::run() {
+    Linux::releaseStartUpCode(); // or it would be locked
+    if (const auto refusal = Linux::lockMemory())
+        _log.notice({refusal->line});
+    _loop.run();
+}
+
+} // namespace ZorvaTouch::Tools

@@ -1,0 +1,101 @@
+#pragma once
+
+#include "Host/Linux/AccelHub.h"
+#include "Host/Linux/AccelMonitor.h"
+#include "Host/Linux/DeviceMonitor.h"
+#include "Host/Linux/MainLoop.h"
+#include "Host/Linux/RateLimitedLogs.h"
+#include "Host/Linux/SleepWatch.h"
+#include "Host/Objects/EventSystem.h"
+#include "Host/Runtime/SerialQueue.h"
+#include "Host/Runtime/StreamWriter.h"
+#include "Tools/Daemon/DaemonOptions.h"
+#include "Tools/Daemon/Listeners.h"
+#include "Tools/Daemon/RecordingKeeper.h"
+#include "Tools/Daemon/SimulatedSurface.h"
+#include "Tools/Daemon/Surfaces.h"
+#include "Tools/Hosting/SessionPlatform.h"
+
+#include <list>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace ZorvaTouch::Tools {
+
+/// What the daemon has around it. Tests hand in doubles.
+struct DaemonSurroundings {
+    std::string plugIn;                       ///< the file
+    Ports::LogProvider &logs;                 ///< borrowed
+    Ports::Clock &clock;                      ///< borrowed
+    std::shared_ptr<Host::TextWriter> output; ///< standard output
+    bool usesColour = false;                  ///< standard output is a terminal that shows colours
+    KeyboardMaker keyboard;                   ///< empty: keys are shown
+    DeviceFinder finder;                      ///< makes the devices that the system tells of
+};
+
+/// The driver: from the surfaces that are there to the keys of one keyboard. It puts the parts together and
+/// lets them hear of each other; what each does is its own affair.
+///
+/// Threads: the one that makes it, which becomes the main thread, and those of its parts. Signals that it
+/// hears are
+///          blocked from then on.
+class Daemon {
+public:
+    /// @param options, surroundings  The first is borrowed.
+    /// @throws std::runtime_error  It cannot work at all, with the reason in one line.
+    Daemon(const DaemonOptions &options, DaemonSurroundings surroundings);
+    /// Every key goes up, and recordings that are wanted are saved.
+    ~Daemon();
+    Daemon(const Daemon &) = delete;
+    Daemon &operator=(const Daemon &) = delete;
+
+    /// Serves until a signal, or until all that was simulated has been played.
+    /// @throws std::runtime_error
+    void run();
+
+private:
+    void checkPlugIn();
+    [[nodiscard]] std::unique_ptr<DaemonListener> makeListener();
+    [[nodiscard]] std::shared_ptr<Linux::RateLimitedLogs> makeLogs();
+    /// Of the key thread, 0 if none is allowed.
+    [[nodiscard]] int realTimePriority() const;
+
+    void watchSignals();
+    void watchAccelerometers();
+    void startSimulations();
+    void watchDevices();
+    void watchSleep();
+
+    [[nodiscard]] Ref<Host::Accelerometer> simulatedAccelerometer();
+    void noteAccelerometer();
+    void flushLogsWhenDue();
+    void finishSimulation();
+
+    const DaemonOptions &_options;
+    const DaemonSurroundings _surroundings;
+
+    Linux::MainLoop _loop;
+    std::vector<Linux::LoopWatch> _watches; ///< for as long as the daemon lives
+    Linux::LoopWatch _logFlush;
+    const std::shared_ptr<Linux::RateLimitedLogs> _logs;
+    SessionPlatform _platform;
+    const DaemonLog _log;
+    EventStream _stream;
+    const std::unique_ptr<DaemonListener> _listener;
+    Host::SerialQueue _keyQueue;
+    Keyboard _keyboard;
+    const std::shared_ptr<Host::EventSystem> _events;
+    RecordingKeeper _recordings;
+    Surfaces _surfaces;
+    std::optional<Linux::AccelHub> _accelHub;
+    std::string _accelerometer; ///< the one that is used, for people; empty: none
+    std::optional<Linux::AccelMonitor> _accelMonitor;
+    std::list<SimulatedSurface> _simulations;
+    std::size_t _playing = 0; ///< of the simulations
+    std::optional<Linux::DeviceMonitor> _deviceMonitor;
+    std::optional<Linux::SleepWatch> _sleepWatch;
+};
+
+} // namespace ZorvaTouch::Tools

@@ -1,0 +1,30 @@
+#include "Tools/Daemon/DaemonChoices.h"
+
+#include <string>
+#include <variant>
+
+namespace ZorvaTouch::Tools {
+
+Linux::DeviceFilter deviceFilterOf(const DaemonOptions &options) {
+    Linux::DeviceFilter filter;
+    if (options.devices.empty())
+        filter.ids = options.ids;
+    for (const DeviceOption &device : options.devices)
+        if (const auto *const path = std::get_if<std::string>(&device))
+            filter.nodes.push_back(*path);
+    return filter;
+}
+
+Linux::AccelChoice accelChoiceOf(const AccelOption &option) {
+    switch (option.choice) {
+    case AccelOption::Choice::Any:
+        return Linux::AccelChoice::any();
+    case AccelOption::Choice::None:
+        return Linux::AccelChoice::none();
+    case AccelOption::Choice::Named:
+        return Linux::AccelChoice::named(option.name);
+    }
+    return Linux::AccelChoice::none();
+}
+
+} // namespace ZorvaTouch::Tools

@@ -1,0 +1,15 @@
+#pragma once
+
+#include "Host/Linux/AccelChoice.h"
+#include "Host/Linux/DeviceTracker.h"
+#include "Tools/Daemon/DaemonOptions.h"
+
+/// What the options mean to the parts that find devices.
+namespace ZorvaTouch::Tools {
+
+/// The devices that the system shall be asked for; empty if only simulated ones are wanted.
+[[nodiscard]] Linux::DeviceFilter deviceFilterOf(const DaemonOptions &options);
+
+[[nodiscard]] Linux::AccelChoice accelChoiceOf(const AccelOption &option);
+
+} // namespace ZorvaTouch::Tools

@@ -1,0 +1,45 @@
+#pragma once
+
+#include "Shared/HostEvent.h"
+#include "Tools/Daemon/EventLines.h"
+#include "Tools/Daemon/KeyMap.h"
+
+#include <cstddef>
+#include <string>
+#include <string_view>
+
+namespace ZorvaTouch::Tools {
+
+/// A surface as the daemon speaks of it.
+struct SurfaceName {
+    std::string id; ///< what it keeps when it is attached anew: serial number, or place; no two have the same
+    std::string node; ///< "/dev/hidraw0", "sim:day"
+    std::string name; ///< the device's own; may be empty
+};
+
+/// Hears what happens in the daemon.
+///
+/// Threads: gestures and keys on the key thread, everything else on the main thread; one listener hears of
+/// both at
+///          the same time. Must not block: a key may be down.
+class DaemonListener {
+public:
+    virtual ~DaemonListener() = default;
+
+    /// @param reason  One line, where the state is `Failed`; empty otherwise.
+    virtual void onSurface(const SurfaceName &surface, SurfaceState state,
+                           std::string_view reason) noexcept = 0;
+    /// An event of the plug-in, before the keys that it moves.
+    virtual void onEvent(const SurfaceName &surface, const HostEvent &event) noexcept = 0;
+    /// The keyboard's key went down or up.
+    /// @param cause   The event whose doing it is; null for a surface's end.
+    /// @param isSent  Whether there is a keyboard; else it would have.
+    virtual void onKey(const SurfaceName &surface, const HostEvent *cause, KeyChange change,
+                       bool isSent) noexcept = 0;
+    virtual void onAccelerometer(const std::string &name, bool isUsed) noexcept = 0;
+    virtual void onSleep(bool begins) noexcept = 0;
+    virtual void onRecording(const SurfaceName &surface, const std::string &file,
+                             std::size_t reports) noexcept = 0;
+};
+
+} // namespace ZorvaTouch::Tools

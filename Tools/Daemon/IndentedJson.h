@@ -1,0 +1,13 @@
+#pragma once
+
+#include <string>
+#include <string_view>
+
+namespace ZorvaTouch::Tools {
+
+/// Puts each value of a JSON text on a line of its own, indented by two blanks a level, and ends the last
+/// line.
+/// @param json  One well-formed value without white space.
+[[nodiscard]] std::string indentedJson(std::string_view json);
+
+} // namespace ZorvaTouch::Tools

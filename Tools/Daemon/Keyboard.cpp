@@ -1,0 +1,54 @@
+#include "Tools/Daemon/Keyboard.h"
+
+#include <exception>
+#include <utility>
+
+namespace ZorvaTouch::Tools {
+
+Keyboard::Keyboard(KeyboardMaker maker, DaemonListener &listener, DaemonLog log)
+    : _maker(std::move(maker)), _listener(listener), _log(std::move(log)) {
+    plug();
+}
+
+Keyboard::~Keyboard() {
+    for (const KeyChange release : _held.releaseAll())
+        send(release);
+}
+
+void Keyboard::apply(const SurfaceName &surface, const HostEvent *cause, const KeyChanges &changes) noexcept {
+    for (const KeyChange change : changes) {
+        if (!_held.take(change))
+            continue;
+        send(change);
+        _listener.onKey(surface, cause, change, isPlugged());
+    }
+}
+
+void Keyboard::send(KeyChange change) noexcept {
+    if (!_output || trySend(change))
+        return;
+    _output.reset();
+    plug();
+    // On a new keyboard every key is up.
+    if (change.isPressed && _output)
+        static_cast<void>(trySend(change));
+}
+
+bool Keyboard::trySend(KeyChange change) noexcept {
+    const auto failure = change.isPressed ? _output->press(change.code) : _output->release(change.code);
+    if (failure)
+        _log.error(change.isPressed ? "cannot press a key" : "cannot release a key", *failure);
+    return !failure;
+}
+
+void Keyboard::plug() noexcept {
+    if (_output || !_maker)
+        return;
+    try {
+        _output = _maker();
+    } catch (const std::exception &error) {
+        _log.error({"keys are shown, not pressed: ", error.what()});
+    }
+}
+
+} // namespace ZorvaTouch::Tools

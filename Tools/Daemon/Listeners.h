@@ -1,0 +1,101 @@
+#pragma once
+
+#include "Shared/Util/Ticks.h"
+#include "Tools/Daemon/DaemonListener.h"
+#include "Tools/Daemon/DaemonLog.h"
+#include "Tools/Daemon/EventStream.h"
+
+#include <cstdint>
+#include <memory>
+#include <utility>
+#include <vector>
+
+/// Who hears what happens in the daemon: the log, other programs, people.
+namespace ZorvaTouch::Tools {
+
+/// Tells several.
+class ListenerGroup final : public DaemonListener {
+public:
+    explicit ListenerGroup(std::vector<std::unique_ptr<DaemonListener>> members)
+        : _members(std::move(members)) {}
+
+    void onSurface(const SurfaceName &surface, SurfaceState state, std::string_view reason) noexcept override;
+    void onEvent(const SurfaceName &surface, const HostEvent &event) noexcept override;
+    void onKey(const SurfaceName &surface, const HostEvent *cause, KeyChange change,
+               bool isSent) noexcept override;
+    void onAccelerometer(const std::string &name, bool isUsed) noexcept override;
+    void onSleep(bool begins) noexcept override;
+    void onRecording(const SurfaceName &surface, const std::string &file,
+                     std::size_t reports) noexcept override;
+
+private:
+    const std::vector<std::unique_ptr<DaemonListener>> _members;
+};
+
+/// Tells the log what is worth a line: not gestures and keys, which are somebody's private affair.
+class LogListener final : public DaemonListener {
+public:
+    explicit LogListener(DaemonLog log) : _log(std::move(log)) {}
+
+    void onSurface(const SurfaceName &surface, SurfaceState state, std::string_view reason) noexcept override;
+    void onEvent(const SurfaceName &, const HostEvent &) noexcept override {}
+    void onKey(const SurfaceName &, const HostEvent *, KeyChange, bool) noexcept override {}
+    void onAccelerometer(const std::string &name, bool isUsed) noexcept override;
+    void onSleep(bool begins) noexcept override;
+    void onRecording(const SurfaceName &surface, const std::string &file,
+                     std::size_t reports) noexcept override;
+
+private:
+    const DaemonLog _log;
+};
+
+/// Tells other programs, by the lines of `EventLines.h`. Lines that there is no memory for are lost.
+class JsonListener final : public DaemonListener {
+public:
+    /// @param stream, clock  Borrowed.
+    JsonListener(EventStream &stream, Ports::Clock &clock) : _stream(stream), _clock(clock), _ticks(clock) {}
+
+    void onSurface(const SurfaceName &surface, SurfaceState state, std::string_view reason) noexcept override;
+    void onEvent(const SurfaceName &surface, const HostEvent &event) noexcept override;
+    void onKey(const SurfaceName &surface, const HostEvent *cause, KeyChange change,
+               bool isSent) noexcept override;
+    void onAccelerometer(const std::string &name, bool isUsed) noexcept override;
+    void onSleep(bool begins) noexcept override;
+    void onRecording(const SurfaceName &surface, const std::string &file,
+                     std::size_t reports) noexcept override;
+
+private:
+    template <typename News> void put(const News &news) noexcept;
+    [[nodiscard]] std::uint64_t nowNs() noexcept;
+
+    EventStream &_stream;
+    Ports::Clock &_clock;
+    const Util::TickConverter _ticks;
+};
+
+/// Shows people the keys that are not pressed, since there is no keyboard.
+class ScreenListener final : public DaemonListener {
+public:
+    /// @param stream, clock      Borrowed. Times are shown from now on.
+    /// @param showsSurface  Whether a line says which surface it is about.
+    ScreenListener(EventStream &stream, Ports::Clock &clock, bool usesColour, bool showsSurface);
+
+    void onSurface(const SurfaceName &, SurfaceState, std::string_view) noexcept override {}
+    void onEvent(const SurfaceName &, const HostEvent &) noexcept override {}
+    void onKey(const SurfaceName &surface, const HostEvent *cause, KeyChange change,
+               bool isSent) noexcept override;
+    void onAccelerometer(const std::string &, bool) noexcept override {}
+    void onSleep(bool) noexcept override {}
+    void onRecording(const SurfaceName &, const std::string &, std::size_t) noexcept override {}
+
+private:
+    EventStream &_stream;
+    Ports::Clock &_clock;
+    const Util::TickConverter _ticks;
+    const std::uint64_t _beganTicks;
+    const bool _usesColour;
+    const bool _showsSurface;
+    bool _hasHeading = false; ///< the key thread's
+};
+
+} // namespace ZorvaTouch::Tools

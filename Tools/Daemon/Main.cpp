@@ -1,0 +1,96 @@
+#include "Host/Linux/HidrawFile.h"
+#include "Host/Linux/JournalLogs.h"
+#include "Host/Linux/VirtualKeyboard.h"
+#include "Host/Runtime/SpdlogLogs.h"
+#include "Host/Runtime/SteadyClock.h"
+#include "Host/Runtime/StreamWriter.h"
+#include "Host/Runtime/Terminal.h"
+#include "Tools/Cli/CliError.h"
+#include "Tools/Daemon/Daemon.h"
+#include "Tools/Daemon/Describe.h"
+#include "Tools/Hosting/ProgramFolder.h"
+
+#include <exception>
+#include <memory>
+#include <string>
+#include <string_view>
+#include <variant>
+#include <vector>
+
+namespace {
+
+using namespace ZorvaTouch;
+
+enum ExitStatus { kExitEnded = 0, kExitFailed = 1, kExitWrongUsage = 2 };
+
+std::unique_ptr<Ports::LogProvider> openLogs(Ports::LogLevel level) {
+    if (Linux::JournalLogs::isJournalStream(static_cast<int>(Host::StandardStream::Error)))
+        return std::make_unique<Linux::JournalLogs>(level);
+    return std::make_unique<Host::SpdlogLogs>(level);
+}
+
+Tools::DeviceMaker hidrawDevice(const Linux::DeviceIdentity &device) {
+    return [node = device.devnode](const std::shared_ptr<Linux::HidrawObserver> &observer) {
+        return Linux::HidrawDevice::create(Linux::HidrawFile::opener(node), observer);
+    };
+}
+
+std::string plugInOf(const Tools::DaemonOptions &options) {
+    return options.plugIn.value_or(Tools::besideProgram(ZORVA_PLUGIN_FROM_PROGRAM));
+}
+
+int runDaemon(const Tools::DaemonOptions &options) {
+    const auto logs = openLogs(options.logLevel);
+    Host::SteadyClock clock;
+    Tools::Daemon daemon(
+        options,
+        {.plugIn = plugInOf(options),
+         .logs = *logs,
+         .clock = clock,
+         .output = std::make_shared<Host::StreamWriter>(Host::StandardStream::Output),
+         .usesColour = Host::showsColours(Host::StandardStream::Output),
+         .keyboard = [codes = options.keys.codes()] { return Linux::VirtualKeyboard::create(codes); },
+         .finder = hidrawDevice});
+    daemon.run();
+    return kExitEnded;
+}
+
+void say(Host::StandardStream stream, const std::string &text) {
+    try {
+        Host::writeStandard(stream, text);
+    } catch (const Host::FileFailure &) { // nobody is there to read it: the status must do
+    }
+}
+
+int describe(const Tools::DaemonOptions &options) {
+    const auto progress = [](std::string_view line) {
+        if (Host::isTerminal(Host::StandardStream::Error))
+            say(Host::StandardStream::Error, "zorvatouchd: " + std::string(line) + "\n");
+    };
+    say(Host::StandardStream::Output, describeSystem(options, plugInOf(options), hidrawDevice, progress));
+    return kExitEnded;
+}
+
+int fail(const std::exception &error, ExitStatus status) {
+    say(Host::StandardStream::Error, std::string("zorvatouchd: ") + error.what() + "\n");
+    return status;
+}
+
+} // namespace
+
+int main(int argc, char **argv) {
+    Host::reportBrokenPipes();
+    try {
+        const auto command = Tools::parseDaemonOptions(std::vector<std::string>(argv + 1, argv + argc));
+        if (const auto *const answer = std::get_if<Tools::AnswerOptions>(&command)) {
+            say(Host::StandardStream::Output, answer->text);
+            return kExitEnded;
+        }
+        const auto &options = std::get<Tools::DaemonOptions>(command);
+        return options.describe ? describe(options) : runDaemon(options);
+    } catch (const Tools::CliError &error) {
+        return fail(error, kExitWrongUsage);
+    } catch (const std::exception &error) {
+        return fail(error, kExitFailed);
+    }
+}

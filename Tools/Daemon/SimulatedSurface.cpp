@@ -1,0 +1,47 @@
+#include "Tools/Daemon/SimulatedSurface.h"
+
+#include "Host/Interface/Platform.h"
+
+#include <string>
+#include <utility>
+
+namespace ZorvaTouch::Tools {
+
+SimulatedSurface::SimulatedSurface(const SimulatedFinger &finger, Ref<Host::Accelerometer> accelerometer,
+                                   Linux::MainLoop &loop, std::function<void()> onFinished)
+    : _finger(finger), _loop(loop), _onFinished(std::move(onFinished)), _device(Simulated::Device::create()),
+      _isThere(std::make_shared<bool>(true)), _player(frames(), {.device = _device,
+                                                                 .accelerometer = std::move(accelerometer),
+                                                                 .onReport = nullptr,
+                                                                 .onMetadata = nullptr,
+                                                                 .onState = nullptr}) {}
+
+SimulatedSurface::~SimulatedSurface() { *_isThere = false; }
+
+SurfaceName SimulatedSurface::name() const {
+    const std::string name = "sim:" + std::string(_finger.scenario->name);
+    return {.id = name, .node = name, .name = "simulated surface"};
+}
+
+DeviceMaker SimulatedSurface::maker() const {
+    return [device = _device](const std::shared_ptr<Linux::HidrawObserver> &) { return device; };
+}
+
+void SimulatedSurface::play() { _player.start(Host::processPlatform()); }
+
+/// The finger's, and word to the main thread after the last.
+Simulated::FrameSource SimulatedSurface::frames() {
+    return [this, next = framesOf(_finger)]() -> std::optional<Frame> {
+        std::optional<Frame> frame = next();
+        if (!frame)
+            _loop.post([this, isThere = _isThere] {
+                if (!*isThere)
+                    return;
+                _device->waitUntilHandled();
+                _onFinished();
+            });
+        return frame;
+    };
+}
+
+} // namespace ZorvaTouch::Tools

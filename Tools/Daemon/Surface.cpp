@@ -1,0 +1,74 @@
+#include "Tools/Daemon/Surface.h"
+
+#include "Host/Objects/Service.h"
+#include "Tools/Daemon/SurfaceObserver.h"
+
+#include <cerrno>
+#include <stdexcept>
+#include <utility>
+
+namespace ZorvaTouch::Tools {
+namespace {
+
+/// What a user can do about it.
+std::string_view adviceFor(const Linux::SystemFailure &failure) noexcept {
+    return failure.errorNumber == EACCES || failure.errorNumber == EPERM
+               ? "; a udev rule gives access to it, see the manual"
+               : "";
+}
+
+} // namespace
+
+Surface::Surface(SurfaceSurroundings &surroundings, const SurfaceName &name, const DeviceMaker &maker,
+                 std::function<void(const std::string &)> onLost)
+    : _surroundings(surroundings), _name(name),
+      _observer(std::make_shared<Observer>(surroundings, std::move(onLost))), _service(surroundings.plugIn) {
+    try {
+        _service->start(Host::Service::create(maker(_observer), surroundings.events).get());
+    } catch (const HostingError &) {
+        if (const auto failure = _observer->openFailure())
+            throw std::runtime_error(describe(*failure).append(adviceFor(*failure)));
+        throw;
+    }
+    schedule();
+}
+
+Surface::~Surface() {
+    _observer->forget();
+    unschedule(SurfaceEnd::Stopped);
+    _service.reset(); // what is left in the queue belongs to the plug-in; there is nothing
+}
+
+void Surface::schedule() {
+    _keys = std::make_shared<SurfaceKeys>(_name, _surroundings.keyMap, _surroundings.keyboard,
+                                          _surroundings.listener);
+    _observer->begin(_keys);
+    _service->setEventCallback(SurfaceKeys::receive, _keys.get());
+    _service->schedule(_surroundings.keyQueue.boundary());
+}
+
+void Surface::unschedule(SurfaceEnd end) {
+    _observer->finish();
+    _service->unschedule();
+    letGo(end);
+}
+
+void Surface::letGo(SurfaceEnd end) {
+    _surroundings.keyQueue.submit([keys = _keys, end] { keys->end(end); });
+    _surroundings.keyQueue.drain();
+}
+
+void Surface::reschedule() {
+    unschedule(SurfaceEnd::Unscheduled);
+    schedule();
+}
+
+void Surface::suspend() { letGo(SurfaceEnd::Suspended); }
+
+std::optional<std::string> Surface::recording() const {
+    const auto recording = _service->property("Recording");
+    const std::string *const text = recording ? recording->asString() : nullptr;
+    return text ? std::optional(*text) : std::nullopt;
+}
+
+} // namespace ZorvaTouch::Tools

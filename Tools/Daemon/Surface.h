@@ -1,0 +1,83 @@
+#pragma once
+
+#include "Host/Linux/HidrawDevice.h"
+#include "Host/Linux/MainLoop.h"
+#include "Host/Objects/EventSystem.h"
+#include "Host/Runtime/SerialQueue.h"
+#include "Tools/Daemon/SurfaceKeys.h"
+#include "Tools/Hosting/HostedService.h"
+
+#include <chrono>
+#include <functional>
+#include <memory>
+#include <optional>
+#include <string>
+
+namespace ZorvaTouch::Tools {
+
+/// Makes a surface's device, closed; it tells the observer what happens to it.
+using DeviceMaker = std::function<Ref<ZorvaDevice>(std::shared_ptr<Linux::HidrawObserver>)>;
+
+/// Has something called later, as `Linux::MainLoop::after` does.
+using LoopTimer =
+    std::function<Linux::LoopWatch(std::chrono::microseconds delay, std::function<void()> function)>;
+
+/// What all surfaces share. Borrowed but for the file's name and the event system.
+struct SurfaceSurroundings {
+    std::string plugIn; ///< the file
+    std::shared_ptr<Host::EventSystem> events;
+    Host::SerialQueue &keyQueue;
+    Keyboard &keyboard;
+    KeyMap keyMap;
+    DaemonListener &listener;
+    Linux::MainLoop &loop;
+    DaemonLog log;
+    LoopTimer after = {}; ///< empty: the loop's own
+};
+
+/// A surface that works: its device, the plug-in's service on it, and what its gestures do to the keyboard.
+///
+/// However it ends, on its own account or because it is destroyed, its keys go up: at once when the device is
+/// gone or the plug-in's input thread ends, without waiting for the main thread.
+///
+/// Threads: the main thread.
+class Surface {
+public:
+    /// Opens the device and begins to listen.
+    /// @param onLost  Called on the main thread, once at most, when the surface no longer works, with the
+    /// reason; not
+    ///                from within this object's functions.
+    /// @throws std::runtime_error  It cannot be opened, with the reason in one line.
+    /// @throws std::bad_alloc
+    Surface(SurfaceSurroundings &surroundings, const SurfaceName &name, const DeviceMaker &maker,
+            std::function<void(const std::string &reason)> onLost);
+    /// Closes the device, with everything that came before carried out and every key up.
+    ~Surface();
+    Surface(const Surface &) = delete;
+    Surface &operator=(const Surface &) = delete;
+
+    /// Begins to listen anew: with the accelerometer that is there now.
+    void reschedule();
+    /// Lets go of its keys, and returns when they are up. The touch that goes on does no more.
+    void suspend();
+
+    /// Whether no touch goes on that may still do something.
+    [[nodiscard]] bool isIdle() const noexcept { return _keys->isIdle(); }
+    /// The recording so far; nothing if the service has none.
+    [[nodiscard]] std::optional<std::string> recording() const;
+
+private:
+    class Observer;
+
+    void schedule();
+    void unschedule(SurfaceEnd end);
+    void letGo(SurfaceEnd end);
+
+    SurfaceSurroundings &_surroundings;
+    const SurfaceName _name;
+    const std::shared_ptr<Observer> _observer;
+    std::shared_ptr<SurfaceKeys> _keys; ///< of the last schedule
+    std::optional<HostedService> _service;
+};
+
+} // namespace ZorvaTouch::Tools

@@ -1,0 +1,41 @@
+#pragma once
+
+#include "Plugin/ZorvaPlugIn.h"
+#include "Tools/Daemon/Keyboard.h"
+
+#include <atomic>
+
+namespace ZorvaTouch::Tools {
+
+/// What one surface does to the keyboard from one schedule to the next: the target of its plug-in's events.
+///
+/// Threads: the key thread, but for `isIdle`.
+class SurfaceKeys {
+public:
+    /// @param keyboard, listener  Borrowed.
+    SurfaceKeys(SurfaceName surface, const KeyMap &map, Keyboard &keyboard, DaemonListener &listener);
+
+    /// A `ZorvaEventCallback`; the target is one of these.
+    static void receive(void *target, void *refcon, void *sender, const ZorvaEvent *event,
+                        std::uint32_t options) noexcept;
+
+    /// Lets go of what is down, for one of these reasons.
+    void end(SurfaceEnd end) noexcept;
+
+    /// Whether no touch goes on that may still do something.
+    ///
+    /// Threads: any.
+    [[nodiscard]] bool isIdle() const noexcept { return _isIdle; }
+
+private:
+    void handle(const HostEvent &event) noexcept;
+    void apply(const HostEvent *cause, const KeyChanges &changes) noexcept;
+
+    const SurfaceName _surface;
+    KeyMapper _mapper;
+    Keyboard &_keyboard;
+    DaemonListener &_listener;
+    std::atomic<bool> _isIdle{true};
+};
+
+} // namespace ZorvaTouch::Tools

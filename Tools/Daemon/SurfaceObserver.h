@@ -1,0 +1,48 @@
+#pragma once
+
+#include "Tools/Daemon/Surface.h"
+
+#include <memory>
+#include <optional>
+
+namespace ZorvaTouch::Tools {
+
+/// Hears of the device's end, on whichever thread it happens, and has the keys let go of right there.
+class Surface::Observer final : public Linux::HidrawObserver,
+                                public std::enable_shared_from_this<Surface::Observer> {
+public:
+    using OnLost = std::function<void(const std::string &reason)>;
+
+    Observer(SurfaceSurroundings &surroundings, OnLost onLost);
+
+    // The main thread.
+
+    /// From now on the device is to be scheduled, and its keys are these. One that went while its end was no
+    /// loss is lost now.
+    void begin(std::shared_ptr<SurfaceKeys> keys);
+    /// From now on the device's end is no loss.
+    void finish() noexcept;
+    /// From now on nobody wants to hear of anything.
+    void forget() noexcept { _onLost = nullptr; }
+    /// Why opening failed, if it did.
+    [[nodiscard]] std::optional<Linux::SystemFailure> openFailure() const;
+
+    // Any thread.
+
+    void onGone(const Linux::SystemFailure &reason) noexcept override;
+    void onFailure(const Linux::SystemFailure &failure) noexcept override;
+    void onUnscheduled() noexcept override;
+
+private:
+    void lose(SurfaceEnd end, const char *what, const Linux::SystemFailure *why) noexcept;
+
+    SurfaceSurroundings &_surroundings;
+    OnLost _onLost; ///< the main thread's; empty once it was called or nobody wants to hear
+
+    mutable Host::Mutex _lock;
+    std::shared_ptr<SurfaceKeys> _keys ZORVA_GUARDED_BY(_lock); ///< null: not scheduled, or lost already
+    std::optional<Linux::SystemFailure> _openFailure ZORVA_GUARDED_BY(_lock);
+    std::optional<Linux::SystemFailure> _goneFor ZORVA_GUARDED_BY(_lock); ///< the device tells that only once
+};
+
+} // namespace ZorvaTouch::Tools

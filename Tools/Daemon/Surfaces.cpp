@@ -1,0 +1,167 @@
+#include "Tools/Daemon/Surfaces.h"
+
+#include "Shared/Util/Ticks.h"
+
+#include <algorithm>
+#include <stdexcept>
+#include <utility>
+
+namespace ZorvaTouch::Tools {
+namespace {
+
+/// How often it is looked whether a surface is let go of, while one is waited for.
+constexpr std::chrono::milliseconds kIdleCheck{500};
+
+} // namespace
+
+Surfaces::Surfaces(SurfaceSurroundings surroundings, DeviceFinder finder, Ports::Clock &clock,
+                   SurfaceHooks hooks)
+    : _surroundings(std::move(surroundings)), _finder(std::move(finder)), _clock(clock),
+      _hooks(std::move(hooks)) {}
+
+Surfaces::~Surfaces() { closeAll(); }
+
+// --- Coming and going --------------------------------------------------------------------------------------
+
+void Surfaces::onAdded(const Linux::DeviceIdentity &device) {
+    add({.name = nameOf(device), .syspath = device.syspath, .maker = _finder(device)});
+}
+
+void Surfaces::add(const SurfaceName &name, DeviceMaker maker) {
+    SurfaceName own = name;
+    makeUnique(own.id);
+    add({.name = std::move(own), .syspath = {}, .maker = std::move(maker)});
+}
+
+void Surfaces::add(Entry entry) {
+    Entry &added = _entries.emplace_back(std::move(entry));
+    _surroundings.listener.onSurface(added.name, SurfaceState::Added, {});
+    _hooks.onComing(added.name);
+    open(added);
+}
+
+void Surfaces::onRemoved(const Linux::DeviceIdentity &device) {
+    const auto found =
+        std::ranges::find_if(_entries, [&](const Entry &entry) { return entry.syspath == device.syspath; });
+    if (found == _entries.end())
+        return;
+    close(*found);
+    _surroundings.listener.onSurface(found->name, SurfaceState::Removed, {});
+    _entries.erase(found);
+}
+
+void Surfaces::open(Entry &entry) {
+    try {
+        entry.surface = std::make_unique<Surface>(
+            _surroundings, entry.name, entry.maker,
+            [this, &entry](const std::string &reason) { handleLoss(entry, reason); });
+    } catch (const std::runtime_error &error) {
+        _surroundings.listener.onSurface(entry.name, SurfaceState::Failed, error.what());
+        retryLater(entry);
+        return;
+    }
+    entry.openedNs = nowNs();
+    entry.wantsReschedule = false;
+    _surroundings.listener.onSurface(entry.name, SurfaceState::Opened, {});
+}
+
+void Surfaces::handleLoss(Entry &entry, const std::string &reason) {
+    close(entry);
+    // When it was unplugged the system says so within the next milliseconds.
+    _surroundings.log.notice({entry.name.node, ": ", reason});
+    if (nowNs() - entry.openedNs >=
+        static_cast<std::uint64_t>(std::chrono::nanoseconds(kLongestRetry).count()))
+        entry.nextRetry = kFirstRetry;
+    retryLater(entry);
+}
+
+void Surfaces::retryLater(Entry &entry) {
+    entry.retry = later(entry.nextRetry, [this, &entry] { open(entry); });
+    entry.nextRetry = std::min(entry.nextRetry * 2, kLongestRetry);
+}
+
+void Surfaces::close(Entry &entry) {
+    entry.retry = {};
+    if (!entry.surface)
+        return;
+    entry.surface->suspend();
+    _hooks.onEnding(entry.name, *entry.surface);
+    entry.surface.reset();
+}
+
+void Surfaces::closeAll() {
+    for (Entry &entry : _entries)
+        close(entry);
+    _entries.clear();
+}
+
+// --- All of them -------------------------------------------------------------------------------------------
+
+void Surfaces::reschedule() {
+    for (Entry &entry : _entries)
+        entry.wantsReschedule = entry.surface != nullptr;
+    rescheduleIdle();
+}
+
+void Surfaces::rescheduleIdle() {
+    _rescheduling = {};
+    bool isWaiting = false;
+    for (Entry &entry : _entries) {
+        if (!entry.surface || !entry.wantsReschedule)
+            continue;
+        if (entry.surface->isIdle()) {
+            entry.surface->reschedule();
+            entry.wantsReschedule = false;
+        } else {
+            isWaiting = true;
+        }
+    }
+    if (isWaiting)
+        _rescheduling = later(kIdleCheck, [this] { rescheduleIdle(); });
+}
+
+void Surfaces::suspend() {
+    for (const Entry &entry : _entries)
+        if (entry.surface)
+            entry.surface->suspend();
+}
+
+void Surfaces::forEach(const std::function<void(const SurfaceName &, const Surface &)> &visit) const {
+    for (const Entry &entry : _entries)
+        if (entry.surface)
+            visit(entry.name, *entry.surface);
+}
+
+// --- Names -------------------------------------------------------------------------------------------------
+
+SurfaceName Surfaces::nameOf(const Linux::DeviceIdentity &device) const {
+    SurfaceName name{.id = device.stableId(), .node = device.devnode, .name = device.name};
+    // Makers give the same serial number to more than one device.
+    if (isTaken(name.id))
+        name.id.append("@").append(device.devnode);
+    makeUnique(name.id);
+    return name;
+}
+
+void Surfaces::makeUnique(std::string &id) const {
+    const std::string wanted = id;
+    for (std::size_t number = 2; isTaken(id); ++number)
+        id = wanted + "-" + std::to_string(number);
+}
+
+bool Surfaces::isTaken(const std::string &id) const noexcept {
+    return std::ranges::any_of(_entries, [&](const Entry &entry) { return entry.name.id == id; });
+}
+
+// --- Time --------------------------------------------------------------------------------------------------
+
+Linux::LoopWatch Surfaces::later(std::chrono::milliseconds delay, std::function<void()> function) {
+    return _surroundings.after ? _surroundings.after(delay, std::move(function))
+                               : _surroundings.loop.after(delay, std::move(function));
+}
+
+std::uint64_t Surfaces::nowNs() noexcept {
+    return Util::TickConverter(_clock).nanosecondsFromMachTime(_clock.nowTicks());
+}
+
+} // namespace ZorvaTouch::Tools

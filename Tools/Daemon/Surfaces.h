@@ -1,0 +1,95 @@
+#pragma once
+
+#include "Host/Linux/DeviceTracker.h"
+#include "Shared/Ports/Clock.h"
+#include "Tools/Daemon/Surface.h"
+
+#include <chrono>
+#include <cstdint>
+#include <functional>
+#include <list>
+#include <memory>
+#include <string>
+
+namespace ZorvaTouch::Tools {
+
+/// How a device that the system has told of is made.
+using DeviceFinder = std::function<DeviceMaker(const Linux::DeviceIdentity &)>;
+
+/// Called as surfaces come and go, on the main thread.
+struct SurfaceHooks {
+    std::function<void(const SurfaceName &)> onComing; ///< before it is opened for the first time
+    /// For each surface that worked and is about to be closed, its keys up.
+    std::function<void(const SurfaceName &, const Surface &)> onEnding;
+};
+
+/// The surfaces that are there: opens each that comes, closes it when it goes, and tries again, ever less
+/// often, when it fails in between.
+///
+/// Threads: the main thread.
+class Surfaces final : public Linux::DeviceListener {
+public:
+    /// The first try again comes so much later; each further one after twice as long, up to the longest. A
+    /// surface that has worked for the longest begins anew.
+    static constexpr std::chrono::milliseconds kFirstRetry{250};
+    static constexpr std::chrono::milliseconds kLongestRetry{30'000};
+
+    /// @param clock  Tells how long a surface has worked. Borrowed.
+    Surfaces(SurfaceSurroundings surroundings, DeviceFinder finder, Ports::Clock &clock, SurfaceHooks hooks);
+    /// Closes all of them.
+    ~Surfaces() override;
+    Surfaces(const Surfaces &) = delete;
+    Surfaces &operator=(const Surfaces &) = delete;
+
+    void onAdded(const Linux::DeviceIdentity &device) override;
+    void onRemoved(const Linux::DeviceIdentity &device) override;
+
+    /// A surface that the system does not tell of.
+    void add(const SurfaceName &name, DeviceMaker maker);
+
+    /// Has every surface listen anew as soon as nothing is touched there.
+    void reschedule();
+    /// Lets go of every key.
+    void suspend();
+    /// Closes all of them.
+    void closeAll();
+
+    /// @param visit  Called for each surface that works, in the order in which they came.
+    void forEach(const std::function<void(const SurfaceName &, const Surface &)> &visit) const;
+    /// That are there, whether they work or not.
+    [[nodiscard]] std::size_t count() const noexcept { return _entries.size(); }
+
+private:
+    struct Entry {
+        SurfaceName name;
+        std::string syspath; ///< empty for those that the system does not tell of
+        DeviceMaker maker;
+        std::unique_ptr<Surface> surface = {}; ///< null while it does not work
+        std::uint64_t openedNs = 0;
+        std::chrono::milliseconds nextRetry = kFirstRetry;
+        Linux::LoopWatch retry = {};
+        bool wantsReschedule = false;
+    };
+
+    void add(Entry entry);
+    void open(Entry &entry);
+    void handleLoss(Entry &entry, const std::string &reason);
+    void retryLater(Entry &entry);
+    void close(Entry &entry);
+    void rescheduleIdle();
+    [[nodiscard]] SurfaceName nameOf(const Linux::DeviceIdentity &device) const;
+    /// Appends a number if a surface that is there has the identity already.
+    void makeUnique(std::string &id) const;
+    [[nodiscard]] bool isTaken(const std::string &id) const noexcept;
+    [[nodiscard]] Linux::LoopWatch later(std::chrono::milliseconds delay, std::function<void()> function);
+    [[nodiscard]] std::uint64_t nowNs() noexcept;
+
+    SurfaceSurroundings _surroundings;
+    const DeviceFinder _finder;
+    Ports::Clock &_clock;
+    const SurfaceHooks _hooks;
+    std::list<Entry> _entries; ///< which keep their places
+    Linux::LoopWatch _rescheduling;
+};
+
+} // namespace ZorvaTouch::Tools
