@@ -32,9 +32,11 @@ int releaseCode(dl_phdr_info *object, std::size_t, void *) noexcept {
         const std::uintptr_t begin = (object->dlpi_addr + segment.p_vaddr) / pageSize * pageSize;
         const std::uintptr_t end =
             (object->dlpi_addr + segment.p_vaddr + segment.p_memsz) / pageSize * pageSize;
-        // Refused for memory that is locked; then it stays.
-        if (begin < end)
-            static_cast<void>(::madvise(reinterpret_cast<void *>(begin), end - begin, MADV_DONTNEED));
+        if (begin >= end)
+            continue;
+        // Refused for memory that is locked; then it stays. The linker gives addresses as numbers.
+        // NOLINTNEXTLINE(performance-no-int-to-ptr)
+        static_cast<void>(::madvise(reinterpret_cast<void *>(begin), end - begin, MADV_DONTNEED));
     }
     return 0;
 }
