@@ -23,6 +23,7 @@ BROKEN = {
     "an unknown kind": {"type": "touch", "timeNs": 1},
     "an unknown state of a surface": SURFACE | {"state": "closed"},
     "a failure without a reason": SURFACE | {"state": "failed"},
+    "a loss without a reason": SURFACE | {"state": "lost"},
     "a reason where nothing failed": SURFACE | {"reason": "x"},
     "a reason for a removal": SURFACE | {"state": "removed", "reason": "x"},
     "a time before zero": SURFACE | {"timeNs": -1},

@@ -52,6 +52,7 @@ Daemon::Daemon(const DaemonOptions &options, DaemonSurroundings surroundings)
                  .keyMap = options.keys,
                  .listener = *_listener,
                  .loop = _loop,
+                 .threadFailures = [this] { return _platform.failures(); },
                  .log = DaemonLog(*_logs, "Surfaces")},
                 _surroundings.finder, _surroundings.clock,
                 {.onComing = [this](const SurfaceName &name) { _recordings.expect(name); },
@@ -68,6 +69,7 @@ Daemon::Daemon(const DaemonOptions &options, DaemonSurroundings surroundings)
 
 Daemon::~Daemon() {
     _surfaces.closeAll();
+    _keyQueue.drain(); // it may still be about to plug in the keyboard, which goes before it
     _stream.finish();
 }
 

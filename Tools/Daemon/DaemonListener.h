@@ -26,7 +26,7 @@ class DaemonListener {
 public:
     virtual ~DaemonListener() = default;
 
-    /// @param reason  One line, where the state is `Failed`; empty otherwise.
+    /// @param reason  One line, where the state is `Lost` or `Failed`; empty otherwise.
     virtual void onSurface(const SurfaceName &surface, SurfaceState state,
                            std::string_view reason) noexcept = 0;
     /// An event of the plug-in, before the keys that it moves.

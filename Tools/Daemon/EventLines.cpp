@@ -9,7 +9,7 @@ namespace ZorvaTouch::Tools {
 namespace {
 
 /// In the order of `SurfaceState`.
-constexpr std::array<std::string_view, 4> kSurfaceStateNames{"added", "opened", "failed", "removed"};
+constexpr std::array<std::string_view, 5> kSurfaceStateNames{"added", "opened", "lost", "failed", "removed"};
 
 /// Writes the members of one object in the order of the calls.
 class Line {
@@ -62,7 +62,7 @@ void appendLine(std::string &text, const SurfaceNews &news) {
         .add("surface", news.surface)
         .add("node", news.node)
         .add("name", news.name);
-    if (news.state == SurfaceState::Failed)
+    if (news.state == SurfaceState::Failed || news.state == SurfaceState::Lost)
         line.add("reason", news.reason);
     line.endAt(news.timeNs);
 }

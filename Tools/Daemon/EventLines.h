@@ -15,7 +15,8 @@ namespace ZorvaTouch::Tools {
 enum class SurfaceState {
     Added,   ///< it is there
     Opened,  ///< its gestures work
-    Failed,  ///< they do not, for the reason given; it is tried again as long as it is there
+    Lost,    ///< they no longer do, for the reason given
+    Failed,  ///< it cannot be opened, for the reason given; it is tried again as long as it is there
     Removed, ///< it is gone
 };
 struct SurfaceNews {
@@ -23,7 +24,7 @@ struct SurfaceNews {
     std::string_view surface; ///< what stays the same when it is attached anew
     std::string_view node;
     std::string_view name;
-    std::string_view reason; ///< of `Failed`, and not told otherwise
+    std::string_view reason; ///< of `Lost` and `Failed`, and not told otherwise
     std::uint64_t timeNs = 0;
 };
 

@@ -12,26 +12,27 @@ Keyboard::Keyboard(KeyboardMaker maker, DaemonListener &listener, DaemonLog log)
 
 Keyboard::~Keyboard() {
     for (const KeyChange release : _held.releaseAll())
-        send(release);
+        static_cast<void>(send(release));
 }
 
 void Keyboard::apply(const SurfaceName &surface, const HostEvent *cause, const KeyChanges &changes) noexcept {
     for (const KeyChange change : changes) {
         if (!_held.take(change))
             continue;
-        send(change);
-        _listener.onKey(surface, cause, change, isPlugged());
+        const bool isSent = send(change);
+        _listener.onKey(surface, cause, change, isSent);
     }
 }
 
-void Keyboard::send(KeyChange change) noexcept {
-    if (!_output || trySend(change))
-        return;
+bool Keyboard::send(KeyChange change) noexcept {
+    if (_output && trySend(change))
+        return true;
+    if (!_wasPlugged)
+        return false;
     _output.reset();
     plug();
     // On a new keyboard every key is up.
-    if (change.isPressed && _output)
-        static_cast<void>(trySend(change));
+    return _output && (!change.isPressed || trySend(change));
 }
 
 bool Keyboard::trySend(KeyChange change) noexcept {
@@ -46,6 +47,7 @@ void Keyboard::plug() noexcept {
         return;
     try {
         _output = _maker();
+        _wasPlugged = true;
     } catch (const std::exception &error) {
         _log.error({"keys are shown, not pressed: ", error.what()});
     }

@@ -42,13 +42,15 @@ public:
     [[nodiscard]] bool isPlugged() const noexcept { return _output != nullptr; }
 
 private:
-    void send(KeyChange change) noexcept;
+    /// @return Whether the system knows.
+    [[nodiscard]] bool send(KeyChange change) noexcept;
     [[nodiscard]] bool trySend(KeyChange change) noexcept;
 
     const KeyboardMaker _maker;
     DaemonListener &_listener;
     const DaemonLog _log;
     HeldKeys _held;
+    bool _wasPlugged = false;                  ///< so that a next one is worth a try with every key
     std::unique_ptr<Linux::KeyOutput> _output; ///< null: none was wanted, or it failed and so did the next
 };
 

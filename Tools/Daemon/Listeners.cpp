@@ -53,6 +53,9 @@ void LogListener::onSurface(const SurfaceName &surface, SurfaceState state,
     case SurfaceState::Opened:
         _log.notice({surface.node, ": gestures work (", surface.id, ")"});
         break;
+    case SurfaceState::Lost: // as whenever somebody unplugs it
+        _log.notice({surface.node, ": ", reason});
+        break;
     case SurfaceState::Failed:
         _log.error({surface.node, ": ", reason});
         break;
@@ -60,10 +63,6 @@ void LogListener::onSurface(const SurfaceName &surface, SurfaceState state,
         _log.notice({surface.node, ": removed (", surface.id, ")"});
         break;
     }
-}
-
-void LogListener::onAccelerometer(const std::string &name, bool isUsed) noexcept {
-    _log.notice({"accelerometer ", name, isUsed ? ": used" : ": gone"});
 }
 
 void LogListener::onSleep(bool begins) noexcept {

@@ -40,7 +40,7 @@ public:
     void onSurface(const SurfaceName &surface, SurfaceState state, std::string_view reason) noexcept override;
     void onEvent(const SurfaceName &, const HostEvent &) noexcept override {}
     void onKey(const SurfaceName &, const HostEvent *, KeyChange, bool) noexcept override {}
-    void onAccelerometer(const std::string &name, bool isUsed) noexcept override;
+    void onAccelerometer(const std::string &, bool) noexcept override {} ///< whoever chose it has said so
     void onSleep(bool begins) noexcept override;
     void onRecording(const SurfaceName &surface, const std::string &file,
                      std::size_t reports) noexcept override;

@@ -1,5 +1,6 @@
 #include "Host/Linux/HidrawFile.h"
 #include "Host/Linux/JournalLogs.h"
+#include "Host/Linux/StandardStreams.h"
 #include "Host/Linux/VirtualKeyboard.h"
 #include "Host/Runtime/SpdlogLogs.h"
 #include "Host/Runtime/SteadyClock.h"
@@ -79,6 +80,7 @@ int fail(const std::exception &error, ExitStatus status) {
 } // namespace
 
 int main(int argc, char **argv) {
+    Linux::fillStandardStreams();
     Host::reportBrokenPipes();
     try {
         const auto command = Tools::parseDaemonOptions(std::vector<std::string>(argv + 1, argv + argc));

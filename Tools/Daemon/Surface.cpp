@@ -44,7 +44,16 @@ void Surface::schedule() {
                                           _surroundings.listener);
     _observer->begin(_keys);
     _service->setEventCallback(SurfaceKeys::receive, _keys.get());
+    const unsigned failuresBefore = threadFailures();
     _service->schedule(_surroundings.keyQueue.boundary());
+    if (threadFailures() == failuresBefore)
+        return;
+    _observer->finish();
+    throw std::runtime_error("the system has no thread, or no descriptors, for its reports");
+}
+
+unsigned Surface::threadFailures() const {
+    return _surroundings.threadFailures ? _surroundings.threadFailures() : 0;
 }
 
 void Surface::unschedule(SurfaceEnd end) {

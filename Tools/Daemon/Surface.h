@@ -31,6 +31,9 @@ struct SurfaceSurroundings {
     KeyMap keyMap;
     DaemonListener &listener;
     Linux::MainLoop &loop;
+    /// Threads and run loops that the plug-in could not have so far; it has no other way to tell. Empty:
+    /// none.
+    std::function<unsigned()> threadFailures = {};
     DaemonLog log;
     LoopTimer after = {}; ///< empty: the loop's own
 };
@@ -57,6 +60,7 @@ public:
     Surface &operator=(const Surface &) = delete;
 
     /// Begins to listen anew: with the accelerometer that is there now.
+    /// @throws std::runtime_error  It does not listen any more, with the reason in one line.
     void reschedule();
     /// Lets go of its keys, and returns when they are up. The touch that goes on does no more.
     void suspend();
@@ -70,6 +74,7 @@ private:
     class Observer;
 
     void schedule();
+    [[nodiscard]] unsigned threadFailures() const;
     void unschedule(SurfaceEnd end);
     void letGo(SurfaceEnd end);
 

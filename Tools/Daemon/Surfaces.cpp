@@ -67,8 +67,7 @@ void Surfaces::open(Entry &entry) {
 
 void Surfaces::handleLoss(Entry &entry, const std::string &reason) {
     close(entry);
-    // When it was unplugged the system says so within the next milliseconds.
-    _surroundings.log.notice({entry.name.node, ": ", reason});
+    _surroundings.listener.onSurface(entry.name, SurfaceState::Lost, reason);
     if (nowNs() - entry.openedNs >=
         static_cast<std::uint64_t>(std::chrono::nanoseconds(kLongestRetry).count()))
         entry.nextRetry = kFirstRetry;
@@ -109,15 +108,22 @@ void Surfaces::rescheduleIdle() {
     for (Entry &entry : _entries) {
         if (!entry.surface || !entry.wantsReschedule)
             continue;
-        if (entry.surface->isIdle()) {
-            entry.surface->reschedule();
-            entry.wantsReschedule = false;
-        } else {
+        if (entry.surface->isIdle())
+            rescheduleNow(entry);
+        else
             isWaiting = true;
-        }
     }
     if (isWaiting)
         _rescheduling = later(kIdleCheck, [this] { rescheduleIdle(); });
+}
+
+void Surfaces::rescheduleNow(Entry &entry) {
+    entry.wantsReschedule = false;
+    try {
+        entry.surface->reschedule();
+    } catch (const std::runtime_error &error) {
+        handleLoss(entry, error.what());
+    }
 }
 
 void Surfaces::suspend() {

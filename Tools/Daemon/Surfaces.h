@@ -77,6 +77,7 @@ private:
     void retryLater(Entry &entry);
     void close(Entry &entry);
     void rescheduleIdle();
+    void rescheduleNow(Entry &entry);
     [[nodiscard]] SurfaceName nameOf(const Linux::DeviceIdentity &device) const;
     /// Appends a number if a surface that is there has the identity already.
     void makeUnique(std::string &id) const;

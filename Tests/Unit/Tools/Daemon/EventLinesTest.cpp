@@ -34,11 +34,12 @@ TEST(EventLines, TellOfSurfaces) {
               "\n");
 }
 
-TEST(EventLines, OnlyFailuresHaveAReason) {
+TEST(EventLines, OnlyFailuresAndLossesHaveAReason) {
     const auto hasReason = [](SurfaceState state, std::string_view reason) {
         return lineOf(surfaceNews(state, reason, 1)).find("\"reason\"") != std::string::npos;
     };
     EXPECT_TRUE(hasReason(SurfaceState::Failed, ""));
+    EXPECT_TRUE(hasReason(SurfaceState::Lost, ""));
     EXPECT_FALSE(hasReason(SurfaceState::Added, "x"));
     EXPECT_FALSE(hasReason(SurfaceState::Opened, "x"));
     EXPECT_FALSE(hasReason(SurfaceState::Removed, "x"));
@@ -109,7 +110,7 @@ TEST(EventLines, WhateverADeviceIsCalledIsOneLineOfJson) {
 
 /// A line of each kind, in the order of the file that the schema is checked with.
 std::string oneOfEach() {
-    const SurfaceNews odd{.state = SurfaceState::Failed,
+    const SurfaceNews odd{.state = SurfaceState::Lost,
                           .surface = "1-2/input0",
                           .node = "sim:day",
                           .name = "\"\x01\xFF\xC3\xA9",

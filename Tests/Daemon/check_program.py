@@ -1,0 +1,217 @@
+#!/usr/bin/python3
+"""Checks the daemon as others start it: what it is told, what it says, and how it ends.
+
+    check_program.py PROGRAM SCHEMA    SCHEMA is that of a line of `--events json`
+
+No surface is needed: all of it is simulated. Every wait is for the thing itself, and fails after a while.
+"""
+
+import json
+import os
+import pathlib
+import signal
+import subprocess
+import sys
+import tempfile
+import time
+import unittest
+
+import jsonschema  # Debian's python3-jsonschema; without it there is nothing to test, which is a failure
+
+LONGEST_WAIT_S = 30
+FINGER = ["--no-keys", "--accel", "none", "--device", "sim:taps"]  # the first tap comes after 0.6 s
+ENDLESS = FINGER + ["--events", "json"]
+
+
+def run(*arguments, **more):
+    more = {"stdin": subprocess.DEVNULL, "stdout": subprocess.PIPE, "stderr": subprocess.PIPE} | more
+    return subprocess.run([PROGRAM, *arguments], text=True, timeout=LONGEST_WAIT_S, check=False, **more)
+
+
+class Running:
+    """The daemon while it runs. Its log goes to a file."""
+
+    def __init__(self, *arguments, **more):
+        self.log = tempfile.TemporaryFile()
+        self.process = subprocess.Popen([PROGRAM, *arguments], stdin=subprocess.DEVNULL, text=True,
+                                        stderr=self.log, **({"stdout": subprocess.PIPE} | more))
+
+    def __enter__(self):
+        return self
+
+    def __exit__(self, *_):
+        if self.process.poll() is None:
+            self.process.kill()
+        self.process.wait()
+        if self.process.stdout:
+            self.process.stdout.close()
+        self.log.close()
+
+    def line_with(self, part):
+        """The next line of its output that has this in it."""
+        for line in self.process.stdout:
+            if part in line:
+                return line
+        raise AssertionError(f"it ended without a line with {part}")
+
+    def wait_until_it_works(self):
+        """For those that have no output: the log says so."""
+        deadline = time.monotonic() + LONGEST_WAIT_S
+        while b"gestures work" not in pathlib.Path(f"/proc/self/fd/{self.log.fileno()}").read_bytes():
+            if time.monotonic() > deadline:
+                raise AssertionError("it does not work")
+
+    def end_by(self, number):
+        """Its status, and how long it took, in seconds."""
+        begin = time.monotonic()
+        self.process.send_signal(number)
+        return self.process.wait(LONGEST_WAIT_S), time.monotonic() - begin
+
+
+class Usage(unittest.TestCase):
+    def test_help_and_version_are_answers(self):
+        for option in ("--help", "-h", "--version"):
+            done = run(option)
+            self.assertEqual((done.returncode, done.stderr), (0, ""), option)
+            self.assertTrue(done.stdout.endswith("\n"), option)
+
+    def test_what_cannot_be_followed_is_one_line_and_status_2(self):
+        for arguments in (["--nonsense"], ["--device"], ["--device", "sim:nonsense"], ["--id", "1"],
+                          ["--events", "xml"], ["--map", "hold:left=KEY_MUTE"], ["--duration", "0"], ["word"]):
+            done = run(*arguments)
+            self.assertEqual((done.returncode, done.stdout), (2, ""), arguments)
+            self.assertRegex(done.stderr, r"\Azorvatouchd: [^\n]+ \(see zorvatouchd --help\)\n\Z")
+
+    def test_a_plug_in_that_is_not_there_is_one_line_and_status_1(self):
+        done = run("--plugin", "/nowhere/plugin.so", *FINGER)
+        self.assertEqual((done.returncode, done.stdout), (1, ""))
+        errors = [line for line in done.stderr.splitlines() if line.startswith("zorvatouchd: ")]
+        self.assertEqual(len(errors), 1, done.stderr)
+        self.assertIn("/nowhere/plugin.so", errors[0])
+
+    def test_answers_do_without_anybody_who_reads_them(self):
+        with open("/dev/full", "w", encoding="ascii") as full:
+            self.assertIn(run("--version", stdout=full).returncode, (0, 1))
+
+
+class Finger(unittest.TestCase):
+    def test_it_ends_by_itself_and_its_lines_are_what_was_promised(self):
+        with tempfile.TemporaryDirectory() as folder:
+            file = os.path.join(folder, "touch.json")
+            done = run(*ENDLESS, "--device", "sim:holds", "--duration", "3", "--save", file)
+            self.assertEqual(done.returncode, 0, done.stderr)
+            self.assertTrue(os.path.exists(file))
+        lines = [json.loads(line) for line in done.stdout.splitlines()]
+        validator = jsonschema.Draft7Validator(SCHEMA)
+        for line in lines:
+            validator.validate(line)
+        self.assertEqual({line["type"] for line in lines}, {"surface", "gesture", "key", "recording"})
+        down = set()
+        for line in lines:
+            if line["type"] == "key":
+                self.assertEqual(line["key"] in down, line["state"] == "up")
+                down ^= {line["key"]}
+        self.assertEqual(down, set())
+
+    def test_people_see_the_keys(self):
+        done = run(*FINGER, "--duration", "0.95")
+        self.assertEqual(done.returncode, 0, done.stderr)
+        self.assertEqual([line.split()[-1] for line in done.stdout.splitlines()], ["is", "down", "up"])
+
+
+class End(unittest.TestCase):
+    def test_each_signal_ends_it_with_0_at_once(self):
+        for number in (signal.SIGTERM, signal.SIGINT, signal.SIGHUP):
+            with Running(*ENDLESS) as daemon:
+                daemon.line_with('"opened"')
+                status, seconds = daemon.end_by(number)
+            self.assertEqual(status, 0, number)
+            self.assertLess(seconds, 1, number)
+
+    def test_a_key_that_is_down_is_told_to_be_up(self):
+        with Running("--no-keys", "--events", "json", "--accel", "none", "--device", "sim:holds") as daemon:
+            daemon.line_with('"state":"down"')
+            daemon.process.send_signal(signal.SIGTERM)
+            daemon.line_with('"state":"up"')
+            self.assertEqual(daemon.process.wait(LONGEST_WAIT_S), 0)
+
+    def test_it_saves_when_told_to_and_goes_on(self):
+        with tempfile.TemporaryDirectory() as folder:
+            file = os.path.join(folder, "touch.json")
+            with Running(*ENDLESS, "--save", file) as daemon:
+                daemon.line_with('"may-begin"')
+                daemon.process.send_signal(signal.SIGUSR1)
+                told = json.loads(daemon.line_with('"recording"'))
+                self.assertEqual(told["file"], file)
+                self.assertGreater(told["reports"], 0)
+                self.assertEqual(os.stat(file).st_mode & 0o7777, 0o600)
+                daemon.line_with('"tap"')
+                self.assertEqual(daemon.end_by(signal.SIGTERM)[0], 0)
+
+
+class Streams(unittest.TestCase):
+    """Whatever its standard streams are, it plays to the end."""
+
+    DONE = ENDLESS + ["--duration", "0.95"]
+
+    def test_a_full_output(self):
+        with open("/dev/full", "w", encoding="ascii") as full:
+            done = run(*self.DONE, stdout=full)
+        self.assertEqual(done.returncode, 0)
+        self.assertEqual(done.stderr.count("standard output"), 1, done.stderr)
+
+    def test_no_output_at_all(self):
+        with tempfile.TemporaryDirectory() as folder:
+            file = os.path.join(folder, "touch.json")
+            done = run(*self.DONE, "--save", file, stdout=None, preexec_fn=lambda: os.close(1))
+            self.assertEqual(done.returncode, 0, done.stderr)
+            json.loads(pathlib.Path(file).read_text(encoding="utf-8"))
+
+    def test_nothing_else_gets_the_number_of_a_stream_that_is_closed(self):
+        def close():
+            os.close(0)
+            os.close(1)
+
+        with Running(*ENDLESS, stdout=None, preexec_fn=close) as daemon:
+            daemon.wait_until_it_works()
+            for number in (0, 1):
+                self.assertEqual(os.readlink(f"/proc/{daemon.process.pid}/fd/{number}"), "/dev/null")
+            self.assertEqual(daemon.end_by(signal.SIGTERM)[0], 0)
+
+    def test_no_input_at_all(self):
+        done = run(*self.DONE, stdin=None, preexec_fn=lambda: os.close(0))
+        self.assertEqual(done.returncode, 0, done.stderr)
+        self.assertIn('"tap"', done.stdout)
+
+    def test_no_stream_at_all(self):
+        done = run(*self.DONE, stdin=None, stdout=None, stderr=None,
+                   preexec_fn=lambda: [os.close(number) for number in range(3)])
+        self.assertEqual(done.returncode, 0)
+
+    def test_an_output_whose_reader_has_gone(self):
+        reader, writer = os.pipe()
+        os.close(reader)
+        with os.fdopen(writer, "w") as output:
+            done = run(*self.DONE, stdout=output)
+        self.assertEqual(done.returncode, 0, done.stderr)
+
+    def test_an_output_whose_reader_hangs(self):
+        reader, writer = os.pipe()
+        os.set_blocking(writer, False)
+        try:
+            while True:
+                os.write(writer, b"x" * 4096)
+        except BlockingIOError:
+            os.set_blocking(writer, True)
+        with os.fdopen(writer, "w") as output, Running(*ENDLESS, stdout=output) as daemon:
+            daemon.wait_until_it_works()
+            status, seconds = daemon.end_by(signal.SIGTERM)
+            self.assertEqual(status, 0)
+            self.assertLess(seconds, 3)
+        os.close(reader)
+
+
+if __name__ == "__main__":
+    PROGRAM = sys.argv.pop(1)
+    SCHEMA = json.loads(pathlib.Path(sys.argv.pop(1)).read_text(encoding="utf-8"))
+    unittest.main()
