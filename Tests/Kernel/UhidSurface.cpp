@@ -104,6 +104,8 @@ private:
     }
 
     void obey(std::string_view line) override {
+        if (line == "mark")
+            return tell("mark");
         if (line.starts_with(kFeature))
             return _options.features.change(line.substr(kFeature.size()));
         const std::vector<std::uint8_t> report = Util::bytesFromHexString(line);

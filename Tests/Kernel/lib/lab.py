@@ -45,41 +45,26 @@ def take_report(descriptor, what="a report"):
     return os.read(descriptor, 4096)
 
 
-class Emulated:
-    """A device that one of the zorvatouch-uhid programs plays: its story, line by line, and its input."""
+class Story:
+    """What a program tells on its standard output, a JSON object a line."""
 
-    def __init__(self, program, *arguments):
+    def __init__(self, program, process, kind="event"):
+        """kind: the key under which a line says what it is about."""
         self.program = program
-        self.process = subprocess.Popen([program, *arguments], stdin=subprocess.PIPE, stdout=subprocess.PIPE)
+        self.process = process
+        self._kind = kind
         self._rest = b""
-        self._story = []
 
-    def say(self, *lines):
-        self.process.stdin.write("".join(f"{line}\n" for line in lines).encode())
-        self.process.stdin.flush()
-
-    def hear(self, event, **wanted):
-        """The next line of this event with these values; lines before it are passed over."""
-        deadline = time.monotonic() + PATIENCE
+    def hear(self, event, patience=PATIENCE, **wanted):
+        """The next line of this kind with these values; lines before it are passed over."""
+        deadline = time.monotonic() + patience
         while True:
-            line = self._next(deadline, event)
-            if line["event"] == event and all(line.get(key) == value for key, value in wanted.items()):
+            line = self.next(deadline, f"{event} {wanted or ''}".rstrip())
+            if line[self._kind] == event and all(line.get(key) == value for key, value in wanted.items()):
                 return line
 
-    def hear_all(self):
-        """Everything up to the end of the story."""
-        deadline = time.monotonic() + PATIENCE
-        story = []
-        while not story or story[-1]["event"] != "end":
-            story.append(self._next(deadline, "end"))
-        return story
-
-    def finish(self):
-        """SIGTERM, and its end. Returns its exit status."""
-        self.process.terminate()
-        return self.process.wait(PATIENCE)
-
-    def _next(self, deadline, awaited):
+    def next(self, deadline, awaited):
+        """The next line; `awaited` is what the failure names if there is none in time."""
         while b"\n" not in self._rest:
             left = max(0.0, deadline - time.monotonic())
             if not select.select([self.process.stdout], [], [], left)[0]:
@@ -90,3 +75,28 @@ class Emulated:
             self._rest += more
         line, self._rest = self._rest.split(b"\n", 1)
         return json.loads(line)
+
+    def finish(self):
+        """SIGTERM, and its end. Returns its exit status."""
+        self.process.terminate()
+        return self.process.wait(PATIENCE)
+
+
+class Emulated(Story):
+    """A device that one of the zorvatouch-uhid programs plays: its story, line by line, and its input."""
+
+    def __init__(self, program, *arguments):
+        super().__init__(program, subprocess.Popen([program, *arguments], stdin=subprocess.PIPE,
+                                                   stdout=subprocess.PIPE))
+
+    def say(self, *lines):
+        self.process.stdin.write("".join(f"{line}\n" for line in lines).encode())
+        self.process.stdin.flush()
+
+    def hear_all(self):
+        """Everything up to the end of the story."""
+        deadline = time.monotonic() + PATIENCE
+        story = []
+        while not story or story[-1]["event"] != "end":
+            story.append(self.next(deadline, "end"))
+        return story

@@ -1,0 +1,9 @@
+#!/usr/bin/env bash
+# A daemon whose surface nobody touches does not wake up.
+# limit 120
+# shellcheck source-path=SCRIPTDIR source=lib/guest.sh
+source "$(dirname -- "${BASH_SOURCE[0]}")/lib/guest.sh"
+
+load hid
+start_udev
+exec /usr/bin/python3 "${tests:?}/daemon-idle.py"
