@@ -184,6 +184,9 @@ TEST_F(EventStreamTest, AReaderThatHangsDoesNotHangTheEnd) {
     stream->finish(kAtOnce);
     stream.reset();
     EXPECT_EQ(reader->text(), "");
+    const std::future<void> gone = reader->gone(); // with the thread, which on a busy machine comes later
+    reader.reset();
+    gone.wait();
     EXPECT_THAT(log->records(),
                 ElementsAre("standard output: its reader hangs; lines that it does not get: 3"));
 }
