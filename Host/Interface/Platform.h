@@ -67,7 +67,7 @@ public:
     [[nodiscard]] virtual std::unique_ptr<Semaphore> createSemaphore() = 0;
 
     /// @param name  At most 15 characters, for those who list threads.
-    /// @param body  Must not throw.
+    /// @param body  Must not throw. No signal comes to it.
     /// @throws std::system_error  There is no thread to be had; `body` is destroyed unrun.
     [[nodiscard]] virtual std::unique_ptr<Thread> startThread(const char *name,
                                                               std::function<void()> body) = 0;

@@ -52,6 +52,8 @@ void handle(udev_device *device, DeviceTracker &tracker, MonitorSource source) {
         tracker.bound(syspath);
     else if (isNode && action == "remove")
         tracker.removed(syspath);
+    else if (isNode && action == "change")
+        tracker.changed(syspath);
     else if (isNode && action == "add")
         if (const auto identity = identityOf(device))
             tracker.added(*identity, source == MonitorSource::Udev);

@@ -34,6 +34,14 @@ void DeviceTracker::bound(std::string_view hidSyspath) {
             tell(_entries[i]);
 }
 
+void DeviceTracker::changed(std::string_view syspath) {
+    const auto found = find(syspath);
+    if (found == _entries.end() || !found->isTold)
+        return;
+    const DeviceIdentity device = found->device; // the listener may call back
+    _listener.onChanged(device);
+}
+
 void DeviceTracker::removed(std::string_view syspath) {
     const auto found = find(syspath);
     if (found == _entries.end())

@@ -15,6 +15,8 @@ public:
     virtual void onAdded(const DeviceIdentity &device) = 0;
     /// It is no longer there; only for a device that was added.
     virtual void onRemoved(const DeviceIdentity &device) = 0;
+    /// Something about it has changed, its permissions say; only for a device that was added.
+    virtual void onChanged(const DeviceIdentity & /*device*/) {}
 };
 
 /// Which devices are wanted: those of some makes, and those under some paths.
@@ -41,6 +43,8 @@ public:
     void added(const DeviceIdentity &device, bool isReady);
     /// The driver has finished with a HID device: its nodes are ready.
     void bound(std::string_view hidSyspath);
+    /// Something about a node has changed.
+    void changed(std::string_view syspath);
     /// A node is gone.
     void removed(std::string_view syspath);
     /// The nodes that are there, all of them ready; others that were told of are gone, and those that were

@@ -70,6 +70,8 @@ void HidrawDevice::deliver(const Callback &callback, std::size_t length) noexcep
         _failuresInARow = 0;
         ++_counters.reports;
     }
+    if (_observer)
+        _observer->onReport();
     const std::uint8_t *const report = callback.buffer.data();
     callback.function(callback.context, ZORVA_STATUS_SUCCESS, this, kInputReportType, report[0], report,
                       length, timestamp);

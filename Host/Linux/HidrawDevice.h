@@ -30,6 +30,8 @@ public:
     virtual void onGone(const SystemFailure &reason) noexcept = 0;
     /// Opening failed, or one read did.
     virtual void onFailure(const SystemFailure &failure) noexcept = 0;
+    /// A report is about to be handed to the callback. Must be quick.
+    virtual void onReport() noexcept {}
     /// The device was taken off its run loop: whoever had scheduled it, or scheduled it anew, listens no
     /// more.
     virtual void onUnscheduled() noexcept {}

@@ -65,7 +65,8 @@ public:
     /// @throws std::system_error
     [[nodiscard]] LoopWatch after(std::chrono::microseconds delay, Function function);
     /// Calls when the process gets a signal, which is blocked on this thread, and on those that are started
-    /// from now on, for good.
+    /// from now on, for good. One that the process was started to ignore stays ignored: nothing is
+    /// served.
     /// @throws std::system_error
     [[nodiscard]] LoopWatch onSignal(int signal, Function function);
 

@@ -38,7 +38,7 @@ KeyboardFailure::KeyboardFailure(const SystemFailure &failed, const std::string 
     : std::runtime_error(textOf(failed, path)), failure(failed) {}
 
 std::optional<std::string> findKeyboardProblem(const std::string &path) {
-    const UniqueFd uinput(::open(path.c_str(), O_WRONLY | O_NONBLOCK | O_CLOEXEC));
+    const UniqueFd uinput(::open(path.c_str(), O_RDWR | O_NONBLOCK | O_CLOEXEC));
     return uinput ? std::nullopt : std::optional(textOf({"open", errno}, path));
 }
 

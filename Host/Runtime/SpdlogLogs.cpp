@@ -2,8 +2,10 @@
 
 #include <spdlog/logger.h>
 #include <spdlog/pattern_formatter.h>
+#include <spdlog/sinks/base_sink.h>
 #include <spdlog/sinks/stdout_sinks.h>
 
+#include <mutex>
 #include <string>
 #include <utility>
 
@@ -30,11 +32,29 @@ std::string fieldsText(std::string_view subsystem, std::string_view category) {
 
 } // namespace
 
+namespace {
+
+/// Hands records to a function.
+class WriterSink final : public spdlog::sinks::base_sink<std::mutex> {
+public:
+    explicit WriterSink(SpdlogLogs::Writer writer) : _writer(std::move(writer)) {}
+
+private:
+    void sink_it_(const spdlog::details::log_msg &message) override {
+        spdlog::memory_buf_t text;
+        formatter_->format(message, text);
+        _writer(std::string(text.data(), text.size()));
+    }
+    void flush_() override {}
+
+    const SpdlogLogs::Writer _writer;
+};
+
+} // namespace
+
 class SpdlogLogs::Sink {
 public:
-    explicit Sink(std::FILE *stream)
-        : logger("",
-                 std::make_shared<spdlog::sinks::stdout_sink_base<spdlog::details::console_mutex>>(stream)) {
+    explicit Sink(spdlog::sink_ptr sink) : logger("", std::move(sink)) {
         // Levels are told apart before a record gets here and are part of its text.
         logger.set_level(spdlog::level::trace);
         logger.set_pattern("%Y-%m-%dT%H:%M:%S.%e%z %v");
@@ -66,7 +86,12 @@ private:
 };
 
 SpdlogLogs::SpdlogLogs(Ports::LogLevel minimum, std::FILE *stream)
-    : _minimum(minimum), _sink(std::make_shared<Sink>(stream)) {}
+    : _minimum(minimum),
+      _sink(std::make_shared<Sink>(
+          std::make_shared<spdlog::sinks::stdout_sink_base<spdlog::details::console_mutex>>(stream))) {}
+
+SpdlogLogs::SpdlogLogs(Ports::LogLevel minimum, Writer writer)
+    : _minimum(minimum), _sink(std::make_shared<Sink>(std::make_shared<WriterSink>(std::move(writer)))) {}
 
 std::shared_ptr<Ports::Log> SpdlogLogs::openLog(std::string_view subsystem, std::string_view category) {
     return std::make_shared<Handle>(_sink, _minimum, fieldsText(subsystem, category));

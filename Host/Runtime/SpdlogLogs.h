@@ -3,7 +3,9 @@
 #include "Shared/Ports/Log.h"
 
 #include <cstdio>
+#include <functional>
 #include <memory>
+#include <string>
 #include <string_view>
 
 namespace ZorvaTouch::Host {
@@ -20,6 +22,13 @@ public:
     /// @param minimum  Records of lower levels are dropped.
     /// @param stream   Borrowed; must outlive the provider and its handles.
     explicit SpdlogLogs(Ports::LogLevel minimum, std::FILE *stream = stderr);
+
+    /// Takes a record with its line break.
+    ///
+    /// Threads: one record at a time, on whichever thread wrote it.
+    using Writer = std::function<void(std::string record)>;
+    /// @param writer  Gets the records. Must not throw.
+    SpdlogLogs(Ports::LogLevel minimum, Writer writer);
 
     [[nodiscard]] std::shared_ptr<Ports::Log> openLog(std::string_view subsystem,
                                                       std::string_view category) override;

@@ -96,6 +96,12 @@ TEST_F(MainLoopTest, HearsSignals) {
     loop.run();
 }
 
+TEST_F(MainLoopTest, LeavesSignalsAloneThatTheProcessIgnores) {
+    ::signal(SIGUSR2, SIG_IGN);
+    EXPECT_FALSE(loop.onSignal(SIGUSR2, [] {}));
+    ::signal(SIGUSR2, SIG_DFL);
+}
+
 TEST_F(MainLoopTest, EndsWithWhatAFunctionThrows) {
     loop.post([] { throw std::runtime_error("planted"); });
     try {

@@ -62,5 +62,15 @@ TEST(SpdlogLogs, AHandleOutlivesItsProvider) {
     EXPECT_THAT(stream.text(), MatchesRegex("[^ ]+ debug subsystem=s category=c still here\n"));
 }
 
+TEST(SpdlogLogs, MayGoToAFunctionInsteadOfAStream) {
+    std::string records;
+    SpdlogLogs logs(Ports::LogLevel::Default, [&](std::string record) { records += record; });
+    const auto log = logs.openLog("subsystem", "category");
+    log->write(Ports::LogLevel::Debug, "too low");
+    log->write(Ports::LogLevel::Error, "a failure");
+    EXPECT_TRUE(records.ends_with(" error subsystem=subsystem category=category a failure\n")) << records;
+    EXPECT_EQ(records.find("too low"), std::string::npos);
+}
+
 } // namespace
 } // namespace ZorvaTouch::Host
