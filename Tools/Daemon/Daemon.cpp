@@ -68,6 +68,7 @@ Daemon::Daemon(const DaemonOptions &options, DaemonSurroundings surroundings)
 }
 
 Daemon::~Daemon() {
+    _watches.clear(); // before what they watch
     _surfaces.closeAll();
     _keyQueue.drain(); // it may still be about to plug in the keyboard, which goes before it
     _stream.finish();
@@ -91,9 +92,10 @@ std::unique_ptr<DaemonListener> Daemon::makeListener() {
     return std::make_unique<ListenerGroup>(std::move(listeners));
 }
 
-int Daemon::realTimePriority() const {
+int Daemon::realTimePriority() {
     if (const auto refusal = Linux::tryRoundRobin(kKeyThreadPriority)) {
         _log.notice({refusal->line});
+        _platform.forgoRealTime();
         return 0;
     }
     return kKeyThreadPriority;
@@ -122,25 +124,40 @@ void Daemon::watchAccelerometers() {
     _accelHub.emplace(_events, accelChoiceOf(_options.accel),
                       _logs->openLog(kLogSubsystem, Linux::kLogCategoryAccelerometer),
                       [this] { _surfaces.reschedule(); });
-    _accelMonitor.emplace(*_accelHub);
-    _watches.push_back(_loop.watch(_accelMonitor->descriptor(), [this] {
-        _accelMonitor->receive();
-        noteAccelerometer();
-    }));
-    _accelMonitor->scan();
+    withAccelMonitor([this] {
+        _accelMonitor.emplace(*_accelHub);
+        _accelWatch = _loop.watch(_accelMonitor->descriptor(),
+                                  [this] { withAccelMonitor([this] { _accelMonitor->receive(); }); });
+        _accelMonitor->scan();
+    });
+    if (_options.accel.choice == AccelOption::Choice::Named && !_accelHub->chosen())
+        _log.notice({"no accelerometer ", _options.accel.name, " is there yet"});
+}
+
+/// Without a monitor accelerometers are not found any more; touches go on.
+void Daemon::withAccelMonitor(const std::function<void()> &use) {
+    try {
+        use();
+    } catch (const std::system_error &error) {
+        _log.error({"accelerometers are not looked for any more: ", error.what()});
+        _accelWatch = {};
+        _accelMonitor.reset();
+    }
     noteAccelerometer();
 }
 
 void Daemon::noteAccelerometer() {
     const auto &chosen = _accelHub->chosen();
-    const std::string now = !chosen ? std::string() : chosen->name.empty() ? chosen->devnode : chosen->name;
-    if (now == _accelerometer)
+    if (chosen == _accelerometer)
         return;
-    if (!_accelerometer.empty())
-        _listener->onAccelerometer(_accelerometer, false);
-    if (!now.empty())
-        _listener->onAccelerometer(now, true);
-    _accelerometer = now;
+    const auto nameOf = [](const Linux::AccelIdentity &accelerometer) {
+        return accelerometer.name.empty() ? accelerometer.devnode : accelerometer.name;
+    };
+    if (_accelerometer)
+        _listener->onAccelerometer(nameOf(*_accelerometer), false);
+    if (chosen)
+        _listener->onAccelerometer(nameOf(*chosen), true);
+    _accelerometer = chosen;
 }
 
 void Daemon::watchDevices() {
@@ -154,7 +171,11 @@ void Daemon::watchDevices() {
         _deviceMonitor->receive();
     }));
     _deviceMonitor->scan();
-    if (_surfaces.count() == 0)
+    if (_surfaces.count() != 0)
+        return;
+    for (const std::string &node : filter.nodes)
+        _log.notice({node, ": no surface is there yet"});
+    if (filter.nodes.empty())
         _log.notice({"no surface is there yet"});
 }
 
@@ -162,10 +183,14 @@ void Daemon::watchSleep() {
     _sleepWatch.emplace(
         _loop, *_logs,
         [this] {
+            _keyQueue.submit([this] { _keyboard.sleep(true); });
             _surfaces.suspend();
             _listener->onSleep(true);
         },
-        [this] { _listener->onSleep(false); });
+        [this] {
+            _keyQueue.submit([this] { _keyboard.sleep(false); });
+            _listener->onSleep(false);
+        });
 }
 
 void Daemon::flushLogsWhenDue() {
@@ -189,8 +214,7 @@ void Daemon::startSimulations() {
 
 /// The finger shakes the machine, too, unless there is a real one to be shaken.
 Ref<Host::Accelerometer> Daemon::simulatedAccelerometer() {
-    return _accelHub && _accelerometer.empty() ? Host::Accelerometer::create(_events)
-                                               : Ref<Host::Accelerometer>();
+    return _accelHub && !_accelerometer ? Host::Accelerometer::create(_events) : Ref<Host::Accelerometer>();
 }
 
 /// When all have been played and nothing else is there to wait for, that was it.

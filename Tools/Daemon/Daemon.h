@@ -16,6 +16,7 @@
 #include "Tools/Daemon/Surfaces.h"
 #include "Tools/Hosting/SessionPlatform.h"
 
+#include <functional>
 #include <list>
 #include <memory>
 #include <optional>
@@ -60,7 +61,7 @@ private:
     [[nodiscard]] std::unique_ptr<DaemonListener> makeListener();
     [[nodiscard]] std::shared_ptr<Linux::RateLimitedLogs> makeLogs();
     /// Of the key thread, 0 if none is allowed.
-    [[nodiscard]] int realTimePriority() const;
+    [[nodiscard]] int realTimePriority();
 
     void watchSignals();
     void watchAccelerometers();
@@ -69,6 +70,7 @@ private:
     void watchSleep();
 
     [[nodiscard]] Ref<Host::Accelerometer> simulatedAccelerometer();
+    void withAccelMonitor(const std::function<void()> &use);
     void noteAccelerometer();
     void flushLogsWhenDue();
     void finishSimulation();
@@ -90,8 +92,9 @@ private:
     RecordingKeeper _recordings;
     Surfaces _surfaces;
     std::optional<Linux::AccelHub> _accelHub;
-    std::string _accelerometer; ///< the one that is used, for people; empty: none
+    std::optional<Linux::AccelIdentity> _accelerometer; ///< the one that is used
     std::optional<Linux::AccelMonitor> _accelMonitor;
+    Linux::LoopWatch _accelWatch;
     std::list<SimulatedSurface> _simulations;
     std::size_t _playing = 0; ///< of the simulations
     std::optional<Linux::DeviceMonitor> _deviceMonitor;

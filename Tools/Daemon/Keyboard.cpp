@@ -1,6 +1,7 @@
 #include "Tools/Daemon/Keyboard.h"
 
 #include <exception>
+#include <new>
 #include <utility>
 
 namespace ZorvaTouch::Tools {
@@ -17,7 +18,7 @@ Keyboard::~Keyboard() {
 
 void Keyboard::apply(const SurfaceName &surface, const HostEvent *cause, const KeyChanges &changes) noexcept {
     for (const KeyChange change : changes) {
-        if (!_held.take(change))
+        if ((_isAsleep && change.isPressed) || !_held.take(change))
             continue;
         const bool isSent = send(change);
         _listener.onKey(surface, cause, change, isSent);
@@ -27,8 +28,6 @@ void Keyboard::apply(const SurfaceName &surface, const HostEvent *cause, const K
 bool Keyboard::send(KeyChange change) noexcept {
     if (_output && trySend(change))
         return true;
-    if (!_wasPlugged)
-        return false;
     _output.reset();
     plug();
     // On a new keyboard every key is up.
@@ -42,14 +41,25 @@ bool Keyboard::trySend(KeyChange change) noexcept {
     return !failure;
 }
 
+/// It is tried with every key, and told when there is something new.
+void Keyboard::tellProblem(const char *problem) noexcept {
+    try {
+        if (_toldProblem == problem)
+            return;
+        _toldProblem = problem;
+    } catch (const std::bad_alloc &) { // then it is told once more
+    }
+    _log.error({"keys are shown, not pressed: ", problem});
+}
+
 void Keyboard::plug() noexcept {
     if (_output || !_maker)
         return;
     try {
         _output = _maker();
-        _wasPlugged = true;
+        _toldProblem.clear();
     } catch (const std::exception &error) {
-        _log.error({"keys are shown, not pressed: ", error.what()});
+        tellProblem(error.what());
     }
 }
 

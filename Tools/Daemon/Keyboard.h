@@ -8,6 +8,7 @@
 
 #include <functional>
 #include <memory>
+#include <string>
 
 namespace ZorvaTouch::Tools {
 
@@ -35,6 +36,9 @@ public:
     /// @param cause  The event whose doing it is; null for the surface's end.
     void apply(const SurfaceName &surface, const HostEvent *cause, const KeyChanges &changes) noexcept;
 
+    /// The machine is about to sleep, or is awake: in between nothing is pressed, as nobody could release it.
+    void sleep(bool begins) noexcept { _isAsleep = begins; }
+
     /// Tries to plug it in if that was not possible before.
     void plug() noexcept;
 
@@ -45,12 +49,14 @@ private:
     /// @return Whether the system knows.
     [[nodiscard]] bool send(KeyChange change) noexcept;
     [[nodiscard]] bool trySend(KeyChange change) noexcept;
+    void tellProblem(const char *problem) noexcept;
 
     const KeyboardMaker _maker;
     DaemonListener &_listener;
     const DaemonLog _log;
     HeldKeys _held;
-    bool _wasPlugged = false;                  ///< so that a next one is worth a try with every key
+    bool _isAsleep = false;
+    std::string _toldProblem;                  ///< why there is no keyboard, as it was told last
     std::unique_ptr<Linux::KeyOutput> _output; ///< null: none was wanted, or it failed and so did the next
 };
 

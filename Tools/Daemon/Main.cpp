@@ -11,6 +11,7 @@
 #include "Tools/Daemon/Describe.h"
 #include "Tools/Hosting/ProgramFolder.h"
 
+#include <cstdint>
 #include <exception>
 #include <memory>
 #include <string>
@@ -24,10 +25,32 @@ using namespace ZorvaTouch;
 
 enum ExitStatus { kExitEnded = 0, kExitFailed = 1, kExitWrongUsage = 2 };
 
+/// The log as text on standard error, by way of a thread of its own: whoever reads it, a terminal that is
+/// stopped say, keeps no key waiting.
+class TextLogs final : public Ports::LogProvider {
+public:
+    explicit TextLogs(Ports::LogLevel level)
+        : _stream(
+              std::make_shared<Host::StreamWriter>(Host::StandardStream::Error),
+              [](std::uint64_t lines) {
+                  return std::to_string(lines) + " lines of the log are missing here\n";
+              },
+              Ports::silentLogProvider().openLog({}, {})),
+          _logs(level, [this](std::string record) { _stream.put(std::move(record)); }) {}
+
+    std::shared_ptr<Ports::Log> openLog(std::string_view subsystem, std::string_view category) override {
+        return _logs.openLog(subsystem, category);
+    }
+
+private:
+    Tools::EventStream _stream;
+    Host::SpdlogLogs _logs; ///< whose handles are gone by the end
+};
+
 std::unique_ptr<Ports::LogProvider> openLogs(Ports::LogLevel level) {
     if (Linux::JournalLogs::isJournalStream(static_cast<int>(Host::StandardStream::Error)))
         return std::make_unique<Linux::JournalLogs>(level);
-    return std::make_unique<Host::SpdlogLogs>(level);
+    return std::make_unique<TextLogs>(level);
 }
 
 Tools::DeviceMaker hidrawDevice(const Linux::DeviceIdentity &device) {
@@ -56,9 +79,12 @@ int runDaemon(const Tools::DaemonOptions &options) {
     return kExitEnded;
 }
 
-void say(Host::StandardStream stream, const std::string &text) {
+/// @throws Host::FileFailure
+void print(const std::string &text) { Host::writeStandard(Host::StandardStream::Output, text); }
+
+void complain(const std::string &text) {
     try {
-        Host::writeStandard(stream, text);
+        Host::writeStandard(Host::StandardStream::Error, "zorvatouchd: " + text + "\n");
     } catch (const Host::FileFailure &) { // nobody is there to read it: the status must do
     }
 }
@@ -66,14 +92,14 @@ void say(Host::StandardStream stream, const std::string &text) {
 int describe(const Tools::DaemonOptions &options) {
     const auto progress = [](std::string_view line) {
         if (Host::isTerminal(Host::StandardStream::Error))
-            say(Host::StandardStream::Error, "zorvatouchd: " + std::string(line) + "\n");
+            complain(std::string(line));
     };
-    say(Host::StandardStream::Output, describeSystem(options, plugInOf(options), hidrawDevice, progress));
+    print(describeSystem(options, plugInOf(options), hidrawDevice, progress));
     return kExitEnded;
 }
 
 int fail(const std::exception &error, ExitStatus status) {
-    say(Host::StandardStream::Error, std::string("zorvatouchd: ") + error.what() + "\n");
+    complain(error.what());
     return status;
 }
 
@@ -85,7 +111,7 @@ int main(int argc, char **argv) {
     try {
         const auto command = Tools::parseDaemonOptions(std::vector<std::string>(argv + 1, argv + argc));
         if (const auto *const answer = std::get_if<Tools::AnswerOptions>(&command)) {
-            say(Host::StandardStream::Output, answer->text);
+            print(answer->text);
             return kExitEnded;
         }
         const auto &options = std::get<Tools::DaemonOptions>(command);

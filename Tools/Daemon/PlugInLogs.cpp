@@ -8,15 +8,17 @@ class PlugInLogs::Handle final : public Ports::Log {
 public:
     explicit Handle(std::shared_ptr<Ports::Log> log) : _log(std::move(log)) {}
 
-    bool isEnabled(Ports::LogLevel level) const noexcept override {
-        return _log->isEnabled(level == Ports::LogLevel::Default ? Ports::LogLevel::Debug : level);
-    }
+    bool isEnabled(Ports::LogLevel level) const noexcept override { return _log->isEnabled(levelFor(level)); }
     void write(Ports::LogLevel level, std::string_view text) noexcept override {
         if (isEnabled(level))
-            _log->write(level, text);
+            _log->write(levelFor(level), text);
     }
 
 private:
+    static Ports::LogLevel levelFor(Ports::LogLevel level) noexcept {
+        return level == Ports::LogLevel::Default ? Ports::LogLevel::Debug : level;
+    }
+
     const std::shared_ptr<Ports::Log> _log;
 };
 

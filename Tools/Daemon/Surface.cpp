@@ -22,7 +22,8 @@ std::string_view adviceFor(const Linux::SystemFailure &failure) noexcept {
 Surface::Surface(SurfaceSurroundings &surroundings, const SurfaceName &name, const DeviceMaker &maker,
                  std::function<void(const std::string &)> onLost)
     : _surroundings(surroundings), _name(name),
-      _observer(std::make_shared<Observer>(surroundings, std::move(onLost))), _service(surroundings.plugIn) {
+      _observer(std::make_shared<Observer>(surroundings, std::move(onLost), [this] { watchSilence(); })),
+      _service(surroundings.plugIn) {
     try {
         _service->start(Host::Service::create(maker(_observer), surroundings.events).get());
     } catch (const HostingError &) {
@@ -34,14 +35,20 @@ Surface::Surface(SurfaceSurroundings &surroundings, const SurfaceName &name, con
 }
 
 Surface::~Surface() {
-    _observer->forget();
-    unschedule(SurfaceEnd::Stopped);
+    stop();
     _service.reset(); // what is left in the queue belongs to the plug-in; there is nothing
+}
+
+void Surface::stop() {
+    _observer->forget();
+    _silence = {};
+    unschedule(SurfaceEnd::Stopped);
 }
 
 void Surface::schedule() {
     _keys = std::make_shared<SurfaceKeys>(_name, _surroundings.keyMap, _surroundings.keyboard,
-                                          _surroundings.listener);
+                                          _surroundings.listener,
+                                          [observer = _observer] { observer->tellHeld(); });
     _observer->begin(_keys);
     _service->setEventCallback(SurfaceKeys::receive, _keys.get());
     const unsigned failuresBefore = threadFailures();
@@ -70,6 +77,21 @@ void Surface::letGo(SurfaceEnd end) {
 void Surface::reschedule() {
     unschedule(SurfaceEnd::Unscheduled);
     schedule();
+}
+
+void Surface::watchSilence() {
+    _reportsHeard = _observer->reports();
+    _silence = _surroundings.later(kLongestSilence, [this] { checkSilence(); });
+}
+
+void Surface::checkSilence() {
+    if (isIdle())
+        return;
+    if (_reportsHeard == 0 ||
+        _reportsHeard != _observer->reports()) // none at all: a device that does not tell
+        return watchSilence();
+    _surroundings.log.error({_name.node, ": silent in the middle of a hold; its keys are let go of"});
+    suspend();
 }
 
 void Surface::suspend() { letGo(SurfaceEnd::Suspended); }

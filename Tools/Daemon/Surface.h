@@ -8,6 +8,7 @@
 #include "Tools/Hosting/HostedService.h"
 
 #include <chrono>
+#include <cstdint>
 #include <functional>
 #include <memory>
 #include <optional>
@@ -36,16 +37,24 @@ struct SurfaceSurroundings {
     std::function<unsigned()> threadFailures = {};
     DaemonLog log;
     LoopTimer after = {}; ///< empty: the loop's own
+
+    [[nodiscard]] Linux::LoopWatch later(std::chrono::milliseconds delay, std::function<void()> function) {
+        return after ? after(delay, std::move(function)) : loop.after(delay, std::move(function));
+    }
 };
 
 /// A surface that works: its device, the plug-in's service on it, and what its gestures do to the keyboard.
 ///
 /// However it ends, on its own account or because it is destroyed, its keys go up: at once when the device is
-/// gone or the plug-in's input thread ends, without waiting for the main thread.
+/// gone or the plug-in's input thread ends, without waiting for the main thread. A device that sends nothing
+/// more in the middle of a hold would leave its key down for ever: after most of a second the key goes up.
 ///
 /// Threads: the main thread.
 class Surface {
 public:
+    /// Between two reports of a device that works there are 10 ms.
+    static constexpr std::chrono::milliseconds kLongestSilence{900};
+
     /// Opens the device and begins to listen.
     /// @param onLost  Called on the main thread, once at most, when the surface no longer works, with the
     /// reason; not
@@ -62,6 +71,8 @@ public:
     /// Begins to listen anew: with the accelerometer that is there now.
     /// @throws std::runtime_error  It does not listen any more, with the reason in one line.
     void reschedule();
+    /// Listens no more: for good, with every key up. What it has recorded stays.
+    void stop();
     /// Lets go of its keys, and returns when they are up. The touch that goes on does no more.
     void suspend();
 
@@ -74,6 +85,8 @@ private:
     class Observer;
 
     void schedule();
+    void watchSilence();
+    void checkSilence();
     [[nodiscard]] unsigned threadFailures() const;
     void unschedule(SurfaceEnd end);
     void letGo(SurfaceEnd end);
@@ -83,6 +96,8 @@ private:
     const std::shared_ptr<Observer> _observer;
     std::shared_ptr<SurfaceKeys> _keys; ///< of the last schedule
     std::optional<HostedService> _service;
+    std::uint64_t _reportsHeard = 0; ///< when silence was looked for last
+    Linux::LoopWatch _silence;       ///< while a key is held
 };
 
 } // namespace ZorvaTouch::Tools

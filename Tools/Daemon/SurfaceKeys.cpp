@@ -7,8 +7,10 @@
 
 namespace ZorvaTouch::Tools {
 
-SurfaceKeys::SurfaceKeys(SurfaceName surface, const KeyMap &map, Keyboard &keyboard, DaemonListener &listener)
-    : _surface(std::move(surface)), _mapper(map), _keyboard(keyboard), _listener(listener) {}
+SurfaceKeys::SurfaceKeys(SurfaceName surface, const KeyMap &map, Keyboard &keyboard, DaemonListener &listener,
+                         std::function<void()> onHeld)
+    : _surface(std::move(surface)), _mapper(map), _keyboard(keyboard), _listener(listener),
+      _onHeld(std::move(onHeld)) {}
 
 void SurfaceKeys::receive(void *target, void * /*refcon*/, void * /*sender*/, const ZorvaEvent *event,
                           std::uint32_t /*options*/) noexcept {
@@ -30,6 +32,9 @@ void SurfaceKeys::end(SurfaceEnd end) noexcept { apply(nullptr, _mapper.handle(e
 
 void SurfaceKeys::apply(const HostEvent *cause, const KeyChanges &changes) noexcept {
     _keyboard.apply(_surface, cause, changes);
+    const bool wasHeld = std::exchange(_isHeld, _mapper.keyDown() != kNoKey);
+    if (_onHeld && _isHeld && !wasHeld)
+        _onHeld();
     _isIdle = _mapper.state() == KeyMapper::State::Idle || _mapper.state() == KeyMapper::State::Over;
 }
 

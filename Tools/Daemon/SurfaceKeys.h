@@ -4,6 +4,7 @@
 #include "Tools/Daemon/Keyboard.h"
 
 #include <atomic>
+#include <functional>
 
 namespace ZorvaTouch::Tools {
 
@@ -13,7 +14,9 @@ namespace ZorvaTouch::Tools {
 class SurfaceKeys {
 public:
     /// @param keyboard, listener  Borrowed.
-    SurfaceKeys(SurfaceName surface, const KeyMap &map, Keyboard &keyboard, DaemonListener &listener);
+    /// @param onHeld  Called when a key is held from now on; may be empty.
+    SurfaceKeys(SurfaceName surface, const KeyMap &map, Keyboard &keyboard, DaemonListener &listener,
+                std::function<void()> onHeld = {});
 
     /// A `ZorvaEventCallback`; the target is one of these.
     static void receive(void *target, void *refcon, void *sender, const ZorvaEvent *event,
@@ -35,6 +38,8 @@ private:
     KeyMapper _mapper;
     Keyboard &_keyboard;
     DaemonListener &_listener;
+    const std::function<void()> _onHeld;
+    bool _isHeld = false;
     std::atomic<bool> _isIdle{true};
 };
 

@@ -8,8 +8,8 @@ namespace ZorvaTouch::Tools {
 
 using Host::MutexLock;
 
-Surface::Observer::Observer(SurfaceSurroundings &surroundings, OnLost onLost)
-    : _surroundings(surroundings), _onLost(std::move(onLost)) {}
+Surface::Observer::Observer(SurfaceSurroundings &surroundings, OnLost onLost, std::function<void()> onHeld)
+    : _surroundings(surroundings), _onHeld(std::move(onHeld)), _onLost(std::move(onLost)) {}
 
 void Surface::Observer::begin(std::shared_ptr<SurfaceKeys> keys) {
     std::optional<Linux::SystemFailure> goneFor;
@@ -31,6 +31,16 @@ void Surface::Observer::finish() noexcept {
 std::optional<Linux::SystemFailure> Surface::Observer::openFailure() const {
     const MutexLock lock(_lock);
     return _openFailure;
+}
+
+void Surface::Observer::tellHeld() noexcept {
+    try {
+        _surroundings.loop.post([self = shared_from_this()] {
+            if (self->_onHeld)
+                self->_onHeld();
+        });
+    } catch (const std::exception &) { // no memory: then nobody watches over this hold
+    }
 }
 
 void Surface::Observer::onGone(const Linux::SystemFailure &reason) noexcept {

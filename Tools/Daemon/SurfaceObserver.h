@@ -2,6 +2,9 @@
 
 #include "Tools/Daemon/Surface.h"
 
+#include <atomic>
+#include <cstdint>
+#include <functional>
 #include <memory>
 #include <optional>
 
@@ -13,7 +16,7 @@ class Surface::Observer final : public Linux::HidrawObserver,
 public:
     using OnLost = std::function<void(const std::string &reason)>;
 
-    Observer(SurfaceSurroundings &surroundings, OnLost onLost);
+    Observer(SurfaceSurroundings &surroundings, OnLost onLost, std::function<void()> onHeld);
 
     // The main thread.
 
@@ -23,12 +26,21 @@ public:
     /// From now on the device's end is no loss.
     void finish() noexcept;
     /// From now on nobody wants to hear of anything.
-    void forget() noexcept { _onLost = nullptr; }
+    void forget() noexcept {
+        _onLost = nullptr;
+        _onHeld = nullptr;
+    }
     /// Why opening failed, if it did.
     [[nodiscard]] std::optional<Linux::SystemFailure> openFailure() const;
 
     // Any thread.
 
+    /// A key is held from now on.
+    void tellHeld() noexcept;
+    /// That the device has handed over so far.
+    [[nodiscard]] std::uint64_t reports() const noexcept { return _reports.load(std::memory_order_relaxed); }
+
+    void onReport() noexcept override { _reports.fetch_add(1, std::memory_order_relaxed); }
     void onGone(const Linux::SystemFailure &reason) noexcept override;
     void onFailure(const Linux::SystemFailure &failure) noexcept override;
     void onUnscheduled() noexcept override;
@@ -37,7 +49,9 @@ private:
     void lose(SurfaceEnd end, const char *what, const Linux::SystemFailure *why) noexcept;
 
     SurfaceSurroundings &_surroundings;
-    OnLost _onLost; ///< the main thread's; empty once it was called or nobody wants to hear
+    std::atomic<std::uint64_t> _reports{0};
+    std::function<void()> _onHeld; ///< the main thread's; empty when nobody wants to hear
+    OnLost _onLost;                ///< the main thread's; empty once it was called or nobody wants to hear
 
     mutable Host::Mutex _lock;
     std::shared_ptr<SurfaceKeys> _keys ZORVA_GUARDED_BY(_lock); ///< null: not scheduled, or lost already

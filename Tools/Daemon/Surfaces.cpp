@@ -50,6 +50,14 @@ void Surfaces::onRemoved(const Linux::DeviceIdentity &device) {
     _entries.erase(found);
 }
 
+void Surfaces::onChanged(const Linux::DeviceIdentity &device) {
+    for (Entry &entry : _entries)
+        if (entry.syspath == device.syspath && !entry.surface) { // now it may be possible
+            entry.nextRetry = kFirstRetry;
+            open(entry);
+        }
+}
+
 void Surfaces::open(Entry &entry) {
     try {
         entry.surface = std::make_unique<Surface>(
@@ -75,7 +83,7 @@ void Surfaces::handleLoss(Entry &entry, const std::string &reason) {
 }
 
 void Surfaces::retryLater(Entry &entry) {
-    entry.retry = later(entry.nextRetry, [this, &entry] { open(entry); });
+    entry.retry = _surroundings.later(entry.nextRetry, [this, &entry] { open(entry); });
     entry.nextRetry = std::min(entry.nextRetry * 2, kLongestRetry);
 }
 
@@ -83,12 +91,16 @@ void Surfaces::close(Entry &entry) {
     entry.retry = {};
     if (!entry.surface)
         return;
-    entry.surface->suspend();
+    entry.surface->stop();
     _hooks.onEnding(entry.name, *entry.surface);
     entry.surface.reset();
 }
 
+/// Nobody keeps a key down while somebody else's recording is saved.
 void Surfaces::closeAll() {
+    for (const Entry &entry : _entries)
+        if (entry.surface)
+            entry.surface->stop();
     for (Entry &entry : _entries)
         close(entry);
     _entries.clear();
@@ -114,7 +126,7 @@ void Surfaces::rescheduleIdle() {
             isWaiting = true;
     }
     if (isWaiting)
-        _rescheduling = later(kIdleCheck, [this] { rescheduleIdle(); });
+        _rescheduling = _surroundings.later(kIdleCheck, [this] { rescheduleIdle(); });
 }
 
 void Surfaces::rescheduleNow(Entry &entry) {
@@ -142,9 +154,9 @@ void Surfaces::forEach(const std::function<void(const SurfaceName &, const Surfa
 
 SurfaceName Surfaces::nameOf(const Linux::DeviceIdentity &device) const {
     SurfaceName name{.id = device.stableId(), .node = device.devnode, .name = device.name};
-    // Makers give the same serial number to more than one device.
+    // Makers give the same serial number to more than one device; those are told apart by their places.
     if (isTaken(name.id))
-        name.id.append("@").append(device.devnode);
+        name.id.append("@").append(device.physicalPath.empty() ? device.devnode : device.physicalPath);
     makeUnique(name.id);
     return name;
 }
@@ -160,11 +172,6 @@ bool Surfaces::isTaken(const std::string &id) const noexcept {
 }
 
 // --- Time --------------------------------------------------------------------------------------------------
-
-Linux::LoopWatch Surfaces::later(std::chrono::milliseconds delay, std::function<void()> function) {
-    return _surroundings.after ? _surroundings.after(delay, std::move(function))
-                               : _surroundings.loop.after(delay, std::move(function));
-}
 
 std::uint64_t Surfaces::nowNs() noexcept {
     return Util::TickConverter(_clock).nanosecondsFromMachTime(_clock.nowTicks());

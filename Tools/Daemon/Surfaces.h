@@ -43,6 +43,7 @@ public:
 
     void onAdded(const Linux::DeviceIdentity &device) override;
     void onRemoved(const Linux::DeviceIdentity &device) override;
+    void onChanged(const Linux::DeviceIdentity &device) override;
 
     /// A surface that the system does not tell of.
     void add(const SurfaceName &name, DeviceMaker maker);
@@ -82,7 +83,6 @@ private:
     /// Appends a number if a surface that is there has the identity already.
     void makeUnique(std::string &id) const;
     [[nodiscard]] bool isTaken(const std::string &id) const noexcept;
-    [[nodiscard]] Linux::LoopWatch later(std::chrono::milliseconds delay, std::function<void()> function);
     [[nodiscard]] std::uint64_t nowNs() noexcept;
 
     SurfaceSurroundings _surroundings;

@@ -75,7 +75,7 @@ void SessionPlatform::waitUntilServing() {
 }
 
 int SessionPlatform::setRoundRobinPriority(int priority) noexcept {
-    return _system.setRoundRobinPriority(priority);
+    return _hasRealTime ? _system.setRoundRobinPriority(priority) : 0;
 }
 
 } // namespace ZorvaTouch::Tools

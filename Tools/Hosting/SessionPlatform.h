@@ -29,6 +29,10 @@ public:
     [[nodiscard]] std::shared_ptr<Host::RunLoop> createRunLoop() override;
     [[nodiscard]] int setRoundRobinPriority(int priority) noexcept override;
 
+    /// From now on threads that ask for real time get none and are not told: it has been found out, and said,
+    /// that the system grants none.
+    void forgoRealTime() noexcept { _hasRealTime = false; }
+
     /// Threads and run loops that could not be had, so far: who asked for them may not be able to tell.
     [[nodiscard]] unsigned failures() const noexcept { return _failures; }
 
@@ -44,6 +48,7 @@ private:
     Host::Platform &_system;
     Ports::Clock &_clock;
     std::atomic<unsigned> _failures{0};
+    std::atomic<bool> _hasRealTime{true};
     std::mutex _lock;
     std::shared_ptr<std::latch> _isServing; ///< of the last run loop; under the lock
 };

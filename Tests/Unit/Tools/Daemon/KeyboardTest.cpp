@@ -76,8 +76,20 @@ TEST_F(KeyboardTest, WithoutAMakerKeysAreShown) {
     EXPECT_THAT(logs.lines().lines(), IsEmpty());
 }
 
+TEST_F(KeyboardTest, WhileTheMachineSleepsNothingIsPressed) {
+    make();
+    apply(left, {kLouder});
+    keyboard->sleep(true);
+    apply(left, {kNoLouder}); // what was down goes up
+    apply(right, {kQuieter, kNoQuieter});
+    keyboard->sleep(false);
+    apply(right, {kQuieter, kNoQuieter});
+    EXPECT_THAT(told.keys.lines(), ElementsAre("L +115", "L -115", "R +114", "R -114"));
+}
+
 TEST_F(KeyboardTest, AMakerThatThrowsIsOneLineAndKeysAreShown) {
-    keys.makerErrors = {"/dev/uinput: Permission denied"};
+    const std::string refusal = "/dev/uinput: Permission denied";
+    keys.makerErrors = {refusal, refusal, refusal}; // it is tried with each key
     make();
     EXPECT_FALSE(keyboard->isPlugged());
     apply(left, {kLouder, kNoLouder});

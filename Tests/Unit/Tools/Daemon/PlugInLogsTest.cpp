@@ -26,8 +26,9 @@ private:
     public:
         Handle(NotedLogs &logs, std::string category) : _logs(logs), _category(std::move(category)) {}
         bool isEnabled(LogLevel level) const noexcept override { return level >= _logs._minimum; }
-        void write(LogLevel, std::string_view text) noexcept override {
-            _logs.texts.push_back(_category + ": " + std::string(text));
+        void write(LogLevel level, std::string_view text) noexcept override {
+            _logs.texts.push_back(_category + (level == LogLevel::Debug ? " debug: " : ": ") +
+                                  std::string(text));
         }
 
     private:
@@ -50,9 +51,9 @@ std::vector<std::string> textsAt(LogLevel minimum) {
 TEST(PlugInLogs, TellGesturesOnlyToThoseWhoDebug) {
     EXPECT_EQ(textsAt(LogLevel::Error), (std::vector<std::string>{"HIDService: a failure"}));
     EXPECT_EQ(textsAt(LogLevel::Default), (std::vector<std::string>{"HIDService: a failure"}));
-    EXPECT_EQ(
-        textsAt(LogLevel::Debug),
-        (std::vector<std::string>{"HIDService: a report", "HIDService: a gesture", "HIDService: a failure"}));
+    EXPECT_EQ(textsAt(LogLevel::Debug),
+              (std::vector<std::string>{"HIDService debug: a report", "HIDService debug: a gesture",
+                                        "HIDService: a failure"}));
 }
 
 } // namespace

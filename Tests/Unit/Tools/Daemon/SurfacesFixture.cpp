@@ -40,24 +40,28 @@ LoopTimer ManualTimers::timer() {
     };
 }
 
-std::vector<std::shared_ptr<ManualTimers::Wait>> ManualTimers::waits() const {
+std::vector<std::shared_ptr<ManualTimers::Wait>> ManualTimers::waits(bool forSilence) const {
     std::erase_if(_waits, [](const std::weak_ptr<Wait> &wait) { return wait.expired(); });
     std::vector<std::shared_ptr<Wait>> all;
     for (const auto &entry : _waits)
-        if (auto wait = entry.lock(); wait && !wait->isDue)
+        if (auto wait = entry.lock();
+            wait && !wait->isDue && (wait->delay == Surface::kLongestSilence) == forSilence)
             all.push_back(std::move(wait));
     return all;
 }
 
 Delays ManualTimers::pending() const {
     Delays delays;
-    for (const auto &wait : waits())
+    for (const auto &wait : waits(false))
         delays.push_back(wait->delay);
     return delays;
 }
 
-std::shared_ptr<const bool> ManualTimers::fireFirst() {
-    const auto all = waits();
+std::shared_ptr<const bool> ManualTimers::fireFirst() { return fire(waits(false)); }
+
+std::shared_ptr<const bool> ManualTimers::fireSilence() { return fire(waits(true)); }
+
+std::shared_ptr<const bool> ManualTimers::fire(const std::vector<std::shared_ptr<Wait>> &all) {
     EXPECT_FALSE(all.empty()) << "nothing is waited for";
     if (all.empty())
         return std::make_shared<bool>(true);
@@ -108,9 +112,13 @@ SurfacesFixture::SurfacesFixture() {
                             .log = DaemonLog(*logs, "Surfaces"),
                             .after = timers.timer()},
         [this](const Linux::DeviceIdentity &device) { return makerOf(device); }, clock,
-        SurfaceHooks{
-            .onComing = [this](const SurfaceName &name) { came.push_back(name.id); },
-            .onEnding = [this](const SurfaceName &name, const Surface &) { ended.push_back(name.id); }});
+        SurfaceHooks{.onComing = [this](const SurfaceName &name) { came.push_back(name.id); },
+                     .onEnding =
+                         [this](const SurfaceName &name, const Surface &) {
+                             ended.push_back(name.id);
+                             if (whenEnding)
+                                 whenEnding();
+                         }});
 }
 
 SurfacesFixture::~SurfacesFixture() {
@@ -178,6 +186,13 @@ void SurfacesFixture::settle() {
 
 void SurfacesFixture::runUntilLost(std::size_t waiting) {
     runUntil([&] { return timers.pending().size() >= waiting; });
+    keyQueue.drain();
+}
+
+void SurfacesFixture::fireSilence() {
+    runUntil([&] { return timers.isWatchingSilence(); });
+    const auto isOver = timers.fireSilence();
+    runUntil([&] { return *isOver; });
     keyQueue.drain();
 }
 

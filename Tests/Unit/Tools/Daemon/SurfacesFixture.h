@@ -37,11 +37,16 @@ public:
     explicit ManualTimers(Linux::MainLoop &loop) : _loop(loop) {}
 
     [[nodiscard]] LoopTimer timer();
+    // Watching over the silence of a device that holds a key is a matter of its own.
+
     /// What is waited for, in the order in which it was asked.
     [[nodiscard]] Delays pending() const;
     /// Lets the oldest be due: one of the loop's next passes calls it.
     /// @return Becomes true when it has been called.
     std::shared_ptr<const bool> fireFirst();
+    /// The same for the oldest wait for the end of a silence.
+    std::shared_ptr<const bool> fireSilence();
+    [[nodiscard]] bool isWatchingSilence() const { return !waits(true).empty(); }
 
 private:
     struct Wait {
@@ -52,7 +57,8 @@ private:
         const std::shared_ptr<bool> isOver = std::make_shared<bool>(false);
     };
 
-    [[nodiscard]] std::vector<std::shared_ptr<Wait>> waits() const;
+    [[nodiscard]] std::vector<std::shared_ptr<Wait>> waits(bool forSilence) const;
+    static std::shared_ptr<const bool> fire(const std::vector<std::shared_ptr<Wait>> &waits);
 
     Linux::MainLoop &_loop;
     mutable std::vector<std::weak_ptr<Wait>> _waits; ///< gone with their watches
@@ -104,6 +110,8 @@ protected:
     void runUntilLost(std::size_t waiting = 1);
     /// Lets the oldest wait be over, and serves what comes of it.
     void fireFirst();
+    /// Lets a second pass on a surface that holds a key.
+    void fireSilence();
 
     const std::shared_ptr<JournalOfLogs> logs = std::make_shared<JournalOfLogs>();
     Simulated::VirtualClock clock;
@@ -122,6 +130,7 @@ protected:
     /// Makes who hears of a device instead of the surface; empty: the surface itself.
     std::function<std::shared_ptr<Linux::HidrawObserver>(std::shared_ptr<Linux::HidrawObserver>)> observedBy;
     Lines came, ended; ///< the surfaces that came, and those that worked and were closed
+    std::function<void()> whenEnding;
     std::optional<Surfaces> surfaces;
 
 private:

@@ -8,6 +8,7 @@
 #include <cstddef>
 #include <ostream>
 #include <string>
+#include <thread>
 #include <utility>
 
 namespace ZorvaTouch::Tools {
@@ -113,10 +114,9 @@ TEST_F(SurfacesTest, ComingBackWhileTheOldOneIsStillThereIsAnotherSurface) {
     surfaces->onRemoved(identity(2, "SN1"));
     surfaces->onAdded(identity(1, "SN1"));
     EXPECT_THAT(told.surfaces.lines(),
-                ElementsAre("added SN1", "opened SN1", "added SN1@/dev/hidraw2", "opened SN1@/dev/hidraw2",
-                            "removed SN1", "removed SN1@/dev/hidraw2", "added SN1", "opened SN1"));
-    EXPECT_THAT(told.keys.lines(),
-                ElementsAre("SN1@/dev/hidraw2 +164 by tap", "SN1@/dev/hidraw2 -164 by tap"));
+                ElementsAre("added SN1", "opened SN1", "added SN1@usb-2", "opened SN1@usb-2", "removed SN1",
+                            "removed SN1@usb-2", "added SN1", "opened SN1"));
+    EXPECT_THAT(told.keys.lines(), ElementsAre("SN1@usb-2 +164 by tap", "SN1@usb-2 -164 by tap"));
 }
 
 TEST_F(SurfacesTest, NoTwoHaveTheSameIdentity) {
@@ -124,8 +124,8 @@ TEST_F(SurfacesTest, NoTwoHaveTheSameIdentity) {
     surfaces->onAdded(identity(2, "SN1"));
     surfaces->onAdded(identity(2, "SN1", "/sys/anew")); // while the one before is not removed yet
     EXPECT_THAT(told.surfaces.lines(),
-                ElementsAre("added SN1", "opened SN1", "added SN1@/dev/hidraw2", "opened SN1@/dev/hidraw2",
-                            "added SN1@/dev/hidraw2-2", "opened SN1@/dev/hidraw2-2"));
+                ElementsAre("added SN1", "opened SN1", "added SN1@usb-2", "opened SN1@usb-2",
+                            "added SN1@usb-2-2", "opened SN1@usb-2-2"));
 }
 
 TEST_F(SurfacesTest, NeitherDoTwoThatTheSystemDoesNotTellOf) {
@@ -481,9 +481,50 @@ TEST_F(SurfacesTest, OneThatIsGoneUnnoticedAndListensAnewIsLost) {
     holdOne();
     unplug(1);
     told.keys.waitFor(2);
+    keyQueue.drain(); // by then it is idle
     surfaces->reschedule();
     runUntilLost();
     EXPECT_THAT(timers.pending(), ElementsAre(250ms));
+}
+
+TEST_F(SurfacesTest, AKeyGoesUpWhenTheDeviceIsSilentInTheMiddleOfAHold) {
+    holdOne();
+    fireSilence(); // the report that began it was the last
+    EXPECT_THAT(keys.down(), IsEmpty());
+    EXPECT_EQ(logs->lines().count("silent in the middle of a hold"), 1u);
+    EXPECT_FALSE(timers.isWatchingSilence());
+}
+
+TEST_F(SurfacesTest, AKeyStaysDownAsLongAsReportsCome) {
+    keepsDevices = true;
+    holdOne();
+    const auto reports = [this] { return lastDevices.at("/dev/hidraw1")->counters().reports; };
+    for (int second = 0; second < 3; ++second) {
+        runUntil([this] { return timers.isWatchingSilence(); });
+        const std::uint64_t before = reports();
+        send(1, {{0x7E, 0}}); // of whichever kind
+        while (reports() == before)
+            std::this_thread::yield();
+        fireSilence();
+    }
+    EXPECT_THAT(keys.down(), SizeIs(1));
+}
+
+TEST_F(SurfacesTest, OneThatChangesIsTriedAgainAtOnce) {
+    opener(1).errors = {EACCES, EACCES}; // to read alone is tried as well
+    surfaces->onAdded(identity(1, "SN1"));
+    EXPECT_THAT(timers.pending(), ElementsAre(250ms));
+    surfaces->onChanged(identity(1, "SN1")); // its permissions, say
+    EXPECT_THAT(told.surfaces.lines().back(), "opened SN1");
+}
+
+TEST_F(SurfacesTest, InTheEndEveryKeyIsUpBeforeAnyRecordingIsSaved) {
+    holdOne();
+    bool wereUp = false;
+    surfaces->onAdded(identity(2, "SN2"));
+    whenEnding = [&] { wereUp = keys.down().empty(); };
+    surfaces->closeAll();
+    EXPECT_TRUE(wereUp);
 }
 
 /// Says that a device is gone in the moment in which it is taken off its run loop, once.
