@@ -71,6 +71,18 @@ TEST(SystemPlatform, TracePointsThatNobodyWatchesDoNothing) {
 
 // --- Semaphores ------------------------------------------------------------------------------------
 
+TEST(SystemThread, GetsNoSignals) {
+    SystemPlatform platform("error");
+    ::sigset_t blocked;
+    ::sigemptyset(&blocked);
+    platform.startThread("test", [&] { ::pthread_sigmask(SIG_SETMASK, nullptr, &blocked); })->join();
+    for (const int signal : {SIGTERM, SIGINT, SIGHUP, SIGUSR1})
+        EXPECT_EQ(::sigismember(&blocked, signal), 1) << signal;
+    ::sigset_t own;
+    ::pthread_sigmask(SIG_SETMASK, nullptr, &own);
+    EXPECT_EQ(::sigismember(&own, SIGTERM), 0) << "the starter's are as before";
+}
+
 TEST(SystemSemaphore, CountsSignals) {
     SystemPlatform platform("error");
     const auto semaphore = platform.createSemaphore();
@@ -94,6 +106,10 @@ TEST(SystemSemaphore, GoesOnWaitingWhenTheThreadIsInterrupted) {
     ::pthread_t waiting{};
     std::atomic<bool> hasWaited = false;
     const auto thread = platform.startThread("test", [&] {
+        ::sigset_t signals; // which such a thread does not get of its own accord
+        ::sigemptyset(&signals);
+        ::sigaddset(&signals, SIGUSR1);
+        ::pthread_sigmask(SIG_UNBLOCK, &signals, nullptr);
         waiting = ::pthread_self();
         hasBegun->signal();
         isDone->wait();
