@@ -100,6 +100,7 @@ std::vector<Bytes> TouchScript::tapPlay() {
 // --- Surfaces ----------------------------------------------------------------------------------------------
 
 SurfacesFixture::SurfacesFixture() {
+    keyQueue.drain(); // its thread runs, for whose start a sanitizer opens a descriptor
     surfaces.emplace(
         SurfaceSurroundings{.plugIn = ZORVA_TEST_PLUGIN,
                             .events = events,
