@@ -76,14 +76,9 @@ class KeyEnd final : public DaemonListener {
 public:
     std::atomic<KeyJourney *> journey{nullptr};
 
-    void onSurface(const SurfaceName &, SurfaceState, std::string_view) noexcept override {}
     void onEvent(const SurfaceName &, const HostEvent &event) noexcept override {
         _report = static_cast<std::size_t>(event.integerField(kDigitizerFieldFrameNumber).value_or(0));
     }
-    void onKey(const SurfaceName &, const HostEvent *, KeyChange, bool) noexcept override {}
-    void onAccelerometer(const std::string &, bool) noexcept override {}
-    void onSleep(bool) noexcept override {}
-    void onRecording(const SurfaceName &, const std::string &, std::size_t) noexcept override {}
 
     void press() noexcept {
         if (KeyJourney *const current = journey)

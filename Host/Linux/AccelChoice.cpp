@@ -1,7 +1,6 @@
 #include "Host/Linux/AccelChoice.h"
 
 #include <string_view>
-#include <utility>
 
 namespace ZorvaTouch::Linux {
 namespace {
@@ -9,12 +8,6 @@ namespace {
 std::string_view lastPart(std::string_view path) noexcept { return path.substr(path.rfind('/') + 1); }
 
 } // namespace
-
-AccelChoice AccelChoice::parse(std::string text) {
-    if (text == "none")
-        return none();
-    return text == "any" ? any() : named(std::move(text));
-}
 
 bool AccelChoice::fits(const AccelIdentity &accelerometer) const noexcept {
     if (_kind != Kind::Named)

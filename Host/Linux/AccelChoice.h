@@ -16,14 +16,10 @@ public:
     /// The first there is, in the order of the syspaths; it stays until it goes.
     [[nodiscard]] static AccelChoice any() { return AccelChoice(Kind::Any, {}); }
     /// @param text  A name ("accel_3d"), a label, a node ("/dev/iio:device0") or the end of one
-    /// ("iio:device0"). Several
-    ///              may fit; then as `any` among them.
+    ///              ("iio:device0"). Several may fit; then as `any` among them.
     [[nodiscard]] static AccelChoice named(std::string text) {
         return AccelChoice(Kind::Named, std::move(text));
     }
-
-    /// As it is written: "none", "any", or else as `named`.
-    [[nodiscard]] static AccelChoice parse(std::string text);
 
     [[nodiscard]] bool fits(const AccelIdentity &accelerometer) const noexcept;
 

@@ -2,8 +2,8 @@
 
 #include "Host/Interface/Mutex.h"
 #include "Host/Linux/UniqueFd.h"
+#include "Host/Runtime/Signals.h"
 
-#include <signal.h>
 #include <sys/epoll.h>
 #include <sys/eventfd.h>
 #include <systemd/sd-event.h>
@@ -28,11 +28,6 @@ constexpr std::uint64_t kTimerAccuracyUs = 1000; // sd-event's own default is a 
 void require(int result, const char *operation) {
     if (result < 0)
         throw std::system_error(-result, std::generic_category(), operation);
-}
-
-bool isIgnored(int signal) noexcept {
-    struct sigaction action {};
-    return ::sigaction(signal, nullptr, &action) == 0 && action.sa_handler == SIG_IGN;
 }
 
 UniqueFd makeEventFd() {
@@ -158,7 +153,7 @@ LoopWatch MainLoop::after(std::chrono::microseconds delay, Function function) {
 }
 
 LoopWatch MainLoop::onSignal(int signal, Function function) {
-    if (isIgnored(signal))
+    if (Host::isSignalIgnored(signal))
         return {};
     auto source = std::make_unique<LoopWatch::Source>(*_state, std::move(function));
     require(::sd_event_add_signal(_state->event, &source->source, signal | SD_EVENT_SIGNAL_PROCMASK,

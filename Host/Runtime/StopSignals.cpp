@@ -1,5 +1,7 @@
 #include "Host/Runtime/StopSignals.h"
 
+#include "Host/Runtime/Signals.h"
+
 #include <poll.h>
 #include <signal.h>
 #include <sys/eventfd.h>
@@ -18,16 +20,11 @@ namespace {
 
 constexpr std::array<int, 3> kStopSignals{SIGINT, SIGTERM, SIGHUP};
 
-bool isIgnored(int signal) noexcept {
-    struct sigaction action {};
-    return ::sigaction(signal, nullptr, &action) == 0 && action.sa_handler == SIG_IGN;
-}
-
 sigset_t watchedSignals() noexcept {
     sigset_t signals;
     ::sigemptyset(&signals);
     for (const int signal : kStopSignals)
-        if (!isIgnored(signal))
+        if (!isSignalIgnored(signal))
             ::sigaddset(&signals, signal);
     return signals;
 }
@@ -47,20 +44,6 @@ public:
 
 private:
     int _number;
-};
-
-/// Blocks signals on the calling thread, and brings back what was blocked before.
-class BlockedSignals {
-public:
-    explicit BlockedSignals(const sigset_t &signals) noexcept {
-        ::pthread_sigmask(SIG_BLOCK, &signals, &_before);
-    }
-    ~BlockedSignals() { ::pthread_sigmask(SIG_SETMASK, &_before, nullptr); }
-    BlockedSignals(const BlockedSignals &) = delete;
-    BlockedSignals &operator=(const BlockedSignals &) = delete;
-
-private:
-    sigset_t _before{};
 };
 
 /// Lets a signal do what it does to a process that knows nothing of it.

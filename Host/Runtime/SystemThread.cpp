@@ -1,8 +1,9 @@
 #include "Host/Runtime/SystemThread.h"
 
+#include "Host/Runtime/Signals.h"
+
 #include <pthread.h>
 #include <sched.h>
-#include <signal.h>
 
 #include <cstddef>
 #include <string>
@@ -13,23 +14,6 @@ namespace ZorvaTouch::Host {
 namespace {
 
 constexpr std::size_t kLongestName = 15; ///< the system refuses longer ones
-
-/// Blocks every signal on the calling thread, and brings back what was blocked before: a thread that is
-/// started meanwhile gets none, they are for the program's own.
-class NoSignals {
-public:
-    NoSignals() noexcept {
-        sigset_t all;
-        ::sigfillset(&all);
-        ::pthread_sigmask(SIG_SETMASK, &all, &_before);
-    }
-    ~NoSignals() { ::pthread_sigmask(SIG_SETMASK, &_before, nullptr); }
-    NoSignals(const NoSignals &) = delete;
-    NoSignals &operator=(const NoSignals &) = delete;
-
-private:
-    sigset_t _before{};
-};
 
 class SystemThread final : public Thread {
 public:
@@ -57,7 +41,7 @@ private:
 } // namespace
 
 std::unique_ptr<Thread> startSystemThread(const char *name, std::function<void()> body) {
-    const NoSignals noSignals;
+    const BlockedSignals blocked(allSignals()); // they are for the program's own threads
     return std::make_unique<SystemThread>(std::string(name ? name : "").substr(0, kLongestName),
                                           std::move(body));
 }

@@ -17,29 +17,28 @@ struct SurfaceName {
     std::string name; ///< the device's own; may be empty
 };
 
-/// Hears what happens in the daemon.
+/// Hears what happens in the daemon; what a listener leaves out it does not care for.
 ///
 /// Threads: gestures and keys on the key thread, everything else on the main thread; one listener hears of
-/// both at
-///          the same time. Must not block: a key may be down.
+///          both at the same time. Must not block: a key may be down.
 class DaemonListener {
 public:
     virtual ~DaemonListener() = default;
 
     /// @param reason  One line, where the state is `Lost` or `Failed`; empty otherwise.
-    virtual void onSurface(const SurfaceName &surface, SurfaceState state,
-                           std::string_view reason) noexcept = 0;
+    virtual void onSurface(const SurfaceName & /*surface*/, SurfaceState /*state*/,
+                           std::string_view /*reason*/) noexcept {}
     /// An event of the plug-in, before the keys that it moves.
-    virtual void onEvent(const SurfaceName &surface, const HostEvent &event) noexcept = 0;
+    virtual void onEvent(const SurfaceName & /*surface*/, const HostEvent & /*event*/) noexcept {}
     /// The keyboard's key went down or up.
     /// @param cause   The event whose doing it is; null for a surface's end.
     /// @param isSent  Whether there is a keyboard; else it would have.
-    virtual void onKey(const SurfaceName &surface, const HostEvent *cause, KeyChange change,
-                       bool isSent) noexcept = 0;
-    virtual void onAccelerometer(const std::string &name, bool isUsed) noexcept = 0;
-    virtual void onSleep(bool begins) noexcept = 0;
-    virtual void onRecording(const SurfaceName &surface, const std::string &file,
-                             std::size_t reports) noexcept = 0;
+    virtual void onKey(const SurfaceName & /*surface*/, const HostEvent * /*cause*/, KeyChange /*change*/,
+                       bool /*isSent*/) noexcept {}
+    virtual void onAccelerometer(const std::string & /*name*/, bool /*isUsed*/) noexcept {}
+    virtual void onSleep(bool /*begins*/) noexcept {}
+    virtual void onRecording(const SurfaceName & /*surface*/, const std::string & /*file*/,
+                             std::size_t /*reports*/) noexcept {}
 };
 
 } // namespace ZorvaTouch::Tools

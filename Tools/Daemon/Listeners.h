@@ -32,15 +32,13 @@ private:
     const std::vector<std::unique_ptr<DaemonListener>> _members;
 };
 
-/// Tells the log what is worth a line: not gestures and keys, which are somebody's private affair.
+/// Tells the log what is worth a line: not gestures and keys, which are somebody's private affair, nor
+/// accelerometers, of which whoever chooses them has told.
 class LogListener final : public DaemonListener {
 public:
     explicit LogListener(DaemonLog log) : _log(std::move(log)) {}
 
     void onSurface(const SurfaceName &surface, SurfaceState state, std::string_view reason) noexcept override;
-    void onEvent(const SurfaceName &, const HostEvent &) noexcept override {}
-    void onKey(const SurfaceName &, const HostEvent *, KeyChange, bool) noexcept override {}
-    void onAccelerometer(const std::string &, bool) noexcept override {} ///< whoever chose it has said so
     void onSleep(bool begins) noexcept override;
     void onRecording(const SurfaceName &surface, const std::string &file,
                      std::size_t reports) noexcept override;
@@ -80,13 +78,8 @@ public:
     /// @param showsSurface  Whether a line says which surface it is about.
     ScreenListener(EventStream &stream, Ports::Clock &clock, bool usesColour, bool showsSurface);
 
-    void onSurface(const SurfaceName &, SurfaceState, std::string_view) noexcept override {}
-    void onEvent(const SurfaceName &, const HostEvent &) noexcept override {}
     void onKey(const SurfaceName &surface, const HostEvent *cause, KeyChange change,
                bool isSent) noexcept override;
-    void onAccelerometer(const std::string &, bool) noexcept override {}
-    void onSleep(bool) noexcept override {}
-    void onRecording(const SurfaceName &, const std::string &, std::size_t) noexcept override {}
 
 private:
     EventStream &_stream;

@@ -37,11 +37,11 @@ TEST(AccelChoices, AnEmptyTextIsNoLabel) {
 }
 
 TEST(AccelChoices, AreWrittenAsNoneAnyOrAText) {
-    EXPECT_FALSE(AccelChoice::parse("none").fits(kLid));
-    EXPECT_TRUE(AccelChoice::parse("any").fits(kLid));
-    EXPECT_TRUE(AccelChoice::parse("accel_3d").fits(kLid));
-    EXPECT_FALSE(AccelChoice::parse("None").fits(kLid));
-    EXPECT_FALSE(AccelChoice::parse("").fits(kLid));
+    EXPECT_FALSE(AccelChoice::none().fits(kLid));
+    EXPECT_TRUE(AccelChoice::any().fits(kLid));
+    EXPECT_TRUE(AccelChoice::named("accel_3d").fits(kLid));
+    EXPECT_FALSE(AccelChoice::named("None").fits(kLid));
+    EXPECT_FALSE(AccelChoice::named("").fits(kLid));
 }
 
 /// A hub and two sensors, the first of which is first by its syspath.
