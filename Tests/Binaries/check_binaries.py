@@ -1,0 +1,82 @@
+"""Checks the programs and libraries of a build tree, and of an installation made from it.
+
+Usage: check_binaries.py BUILD_DIR [--hardened]
+
+No library path has an empty or relative entry: the loader would take libraries from the current directory. With
+--hardened, each file has what Docs/Architecture.md promises for optimized builds.
+"""
+
+import pathlib
+import re
+import subprocess
+import sys
+import tempfile
+
+PRODUCT = {"zorvatouch", "zorvatouchd", "ZorvaTouchHIDService.so", "libzorvahost.so"}
+
+
+def readelf(option, file):
+    return subprocess.run(["readelf", "-W", option, file], check=True, capture_output=True, text=True).stdout
+
+
+def is_elf(file):
+    with open(file, "rb") as stream:
+        return stream.read(4) == b"\x7fELF"
+
+
+def binaries(folder):
+    return sorted(
+        file for place in ("bin", "lib") for file in (folder / place).rglob("*")
+        if file.is_file() and not file.is_symlink() and is_elf(file))
+
+
+def path_faults(dynamic):
+    """Entries of the library path that are not absolute or relative to the file itself."""
+    for path in re.findall(r"\((?:RPATH|RUNPATH)\).*\[(.*)\]", dynamic):
+        for entry in path.split(":"):
+            if not entry.startswith(("/", "$ORIGIN/")) and entry != "$ORIGIN":
+                yield f"library path [{path}] has the entry '{entry}'"
+
+
+def hardening_faults(file, dynamic):
+    if "GNU_RELRO" not in readelf("-l", file):
+        yield "has no RELRO segment"
+    if not re.search(r"\(FLAGS\).*BIND_NOW|\(FLAGS_1\).*NOW", dynamic):
+        yield "binds symbols lazily"
+    if "DYN (" not in readelf("-h", file):
+        yield "is not position-independent"
+    symbols = readelf("--dyn-syms", file)
+    if "__stack_chk_fail" not in symbols:
+        yield "has no stack protector"
+    if not re.search(r"__\w+_chk\b", symbols.replace("__stack_chk_fail", "")):
+        yield "calls no function that FORTIFY checks"
+
+
+def self_test():
+    """The checks find what they are for."""
+    line = " 0x000000000000001d (RUNPATH)            Library runpath: [%s]\n"
+    assert list(path_faults(line % "$ORIGIN/../lib")) == []
+    assert len(list(path_faults(line % "$ORIGIN/../lib:"))) == 1
+    assert len(list(path_faults(line % "lib:/usr/lib"))) == 1
+
+
+def main():
+    self_test()
+    build = pathlib.Path(sys.argv[1])
+    faults = []
+    with tempfile.TemporaryDirectory() as prefix:
+        subprocess.run(["cmake", "--install", build, "--prefix", prefix], check=True, capture_output=True)
+        built, installed = binaries(build), binaries(pathlib.Path(prefix))
+        names = {file.name.split(".so.")[0] + (".so" if ".so." in file.name else "") for file in installed}
+        if names != PRODUCT:
+            faults.append(f"installed: {sorted(names)}, expected {sorted(PRODUCT)}")
+        for file in built + installed:
+            dynamic = readelf("-d", file)
+            faults += [f"{file}: {fault}" for fault in path_faults(dynamic)]
+            if "--hardened" in sys.argv and file in installed:
+                faults += [f"{file}: {fault}" for fault in hardening_faults(file, dynamic)]
+    print("\n".join(faults) or f"{len(built)} built and {len(installed)} installed files.")
+    sys.exit(1 if faults else 0)
+
+
+main()
