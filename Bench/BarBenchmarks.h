@@ -15,4 +15,11 @@ void registerContainerBars(BarTable &table);
 /// @param program  The command line's program, to be run as a process of its own.
 void registerReplayBar(BarTable &table, const std::string &program);
 
+/// Paths of the two builds of `zorvaBenchWork`.
+struct HardeningModules {
+    std::string hardened;
+    std::string plain;
+};
+void registerHardeningBar(BarTable &table, const HardeningModules &modules);
+
 } // namespace ZorvaTouch::Bench

@@ -47,6 +47,7 @@ int main(int argc, char **argv) {
     Bench::registerRecordingBars(bars);
     Bench::registerContainerBars(bars);
     Bench::registerReplayBar(bars, programBeside());
+    Bench::registerHardeningBar(bars, {ZORVA_BENCH_HARDENED, ZORVA_BENCH_PLAIN});
     benchmark::AddCustomContext("compiler", __VERSION__);
     benchmark::RunSpecifiedBenchmarks();
     if (!bars.empty())
