@@ -2,7 +2,7 @@
 # The steps of .ci/run that are more than one command. Sourced after scripts/lib/setup.sh, never run.
 
 check_scripts() {
-    shellcheck --external-sources .ci/determinism .ci/format .ci/run .ci/words .ci/*.sh \
+    shellcheck --external-sources .ci/determinism .ci/format .ci/run .ci/*.sh \
         scripts/bench scripts/fuzz scripts/run scripts/test scripts/test-kernel scripts/lib/*.sh \
         Tests/Kernel/*.sh Tests/Kernel/lib/*.sh Tests/Kernel/lib/*-root
 }
