@@ -2,18 +2,19 @@
 
 #include "Host/Interface/Mutex.h"
 #include "Host/Linux/UniqueFd.h"
-#include "Host/Runtime/Signals.h"
 
 #include <sys/epoll.h>
 #include <sys/eventfd.h>
 #include <systemd/sd-event.h>
 #include <unistd.h>
 
+#include <atomic>
 #include <cerrno>
 #include <cstdint>
 #include <deque>
 #include <exception>
 #include <system_error>
+#include <thread>
 #include <utility>
 
 namespace ZorvaTouch::Linux {
@@ -55,9 +56,17 @@ struct MainLoop::State {
         }
     }
 
+    void wakeUp() const noexcept {
+        const std::uint64_t one = 1;
+        while (::write(wake.get(), &one, sizeof one) < 0 && errno == EINTR) {
+        }
+    }
+
     void runPosted() {
         std::uint64_t count = 0;
-        static_cast<void>(::read(wake.get(), &count, sizeof count));
+        [[maybe_unused]] const ssize_t size = ::read(wake.get(), &count, sizeof count); // reset; never waits
+        if (isQuitting)
+            ::sd_event_exit(event, 0);
         std::deque<Function> functions;
         {
             const MutexLock lock(mutex);
@@ -68,8 +77,10 @@ struct MainLoop::State {
     }
 
     const UniqueFd wake;
+    const std::thread::id thread = std::this_thread::get_id();
     sd_event *event = nullptr;
     std::exception_ptr failure;
+    std::atomic<bool> isQuitting{false};
 
     Host::Mutex mutex;
     std::deque<Function> posted ZORVA_GUARDED_BY(mutex);
@@ -94,9 +105,6 @@ struct LoopWatch::Source {
         return serve(context);
     }
     static int serveTime(sd_event_source *, std::uint64_t, void *context) noexcept { return serve(context); }
-    static int serveSignal(sd_event_source *, const signalfd_siginfo *, void *context) noexcept {
-        return serve(context);
-    }
 
     MainLoop::State &loop;
     const std::shared_ptr<const MainLoop::Function> function;
@@ -123,16 +131,21 @@ void MainLoop::run() {
         std::rethrow_exception(failure);
 }
 
-void MainLoop::quit() noexcept { ::sd_event_exit(_state->event, 0); }
+void MainLoop::quit() noexcept {
+    if (std::this_thread::get_id() == _state->thread) {
+        ::sd_event_exit(_state->event, 0);
+        return;
+    }
+    _state->isQuitting = true;
+    _state->wakeUp();
+}
 
 void MainLoop::post(Function function) {
     {
         const MutexLock lock(_state->mutex);
         _state->posted.push_back(std::move(function));
     }
-    const std::uint64_t one = 1;
-    while (::write(_state->wake.get(), &one, sizeof one) < 0 && errno == EINTR) {
-    }
+    _state->wakeUp();
 }
 
 LoopWatch MainLoop::watch(int descriptor, Function function) {
@@ -149,16 +162,6 @@ LoopWatch MainLoop::after(std::chrono::microseconds delay, Function function) {
                                          static_cast<std::uint64_t>(delay.count()), kTimerAccuracyUs,
                                          LoopWatch::Source::serveTime, source.get()),
             "wait for a time");
-    return LoopWatch(std::move(source));
-}
-
-LoopWatch MainLoop::onSignal(int signal, Function function) {
-    if (Host::isSignalIgnored(signal))
-        return {};
-    auto source = std::make_unique<LoopWatch::Source>(*_state, std::move(function));
-    require(::sd_event_add_signal(_state->event, &source->source, signal | SD_EVENT_SIGNAL_PROCMASK,
-                                  LoopWatch::Source::serveSignal, source.get()),
-            "wait for a signal");
     return LoopWatch(std::move(source));
 }
 

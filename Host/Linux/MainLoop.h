@@ -28,10 +28,9 @@ private:
 };
 
 /// The loop of a program's main thread, on sd-event: it sleeps until a descriptor is readable, a time has
-/// come, a signal arrives or another thread has something to be run. What a function throws ends `run` with
-/// it.
+/// come or another thread has something to be run. What a function throws ends `run` with it.
 ///
-/// Threads: the one that made it, but for `post`.
+/// Threads: the one that made it, but for `post` and `quit`.
 class MainLoop {
 public:
     using Function = std::function<void()>;
@@ -47,7 +46,9 @@ public:
     /// @throws std::system_error  The loop cannot wait any more.
     /// @throws whatever a function throws
     void run();
-    /// Has `run` return when the function that is running is done.
+    /// Has `run` return when the function that is running is done; before `run`, as soon as it begins.
+    ///
+    /// Threads: any.
     void quit() noexcept;
 
     /// Has a function run on the loop's thread, after those posted before. Once the loop is gone nothing
@@ -64,12 +65,6 @@ public:
     /// Calls once, when so much time has passed; in suspend it stands still.
     /// @throws std::system_error
     [[nodiscard]] LoopWatch after(std::chrono::microseconds delay, Function function);
-    /// Calls when the process gets a signal, which is blocked on this thread, and on those that are started
-    /// from now on, for good. One that the process was started to ignore stays ignored: nothing is
-    /// served.
-    /// @throws std::system_error
-    [[nodiscard]] LoopWatch onSignal(int signal, Function function);
-
     /// For libraries that attach themselves. Borrowed.
     [[nodiscard]] sd_event *native() noexcept;
 

@@ -2,6 +2,7 @@
 
 #include <csignal>
 #include <pthread.h>
+#include <span>
 
 namespace ZorvaTouch::Host {
 
@@ -15,6 +16,23 @@ namespace ZorvaTouch::Host {
     sigset_t signals;
     ::sigfillset(&signals);
     return signals;
+}
+
+/// A set of those of the signals that are not ignored.
+[[nodiscard]] inline sigset_t withoutIgnored(std::span<const int> signals) noexcept {
+    sigset_t set;
+    ::sigemptyset(&set);
+    for (const int signal : signals)
+        if (!isSignalIgnored(signal))
+            ::sigaddset(&set, signal);
+    return set;
+}
+
+/// Blocks signals on the calling thread, and on those that it starts from now on, to the end of the process.
+/// Ignored ones stay as they are.
+inline void blockForGood(std::span<const int> signals) noexcept {
+    const sigset_t set = withoutIgnored(signals);
+    ::pthread_sigmask(SIG_BLOCK, &set, nullptr);
 }
 
 /// Blocks signals on the calling thread, and brings back what was blocked before. Threads that are started

@@ -1,7 +1,8 @@
 #pragma once
 
+#include "Host/Runtime/SignalWatch.h"
+
 #include <functional>
-#include <memory>
 
 namespace ZorvaTouch::Host {
 
@@ -18,13 +19,9 @@ public:
     /// @param onStop  Called once at most, and not after the destructor. Must not throw.
     /// @throws std::system_error
     explicit StopSignals(std::function<void()> onStop);
-    ~StopSignals();
-    StopSignals(const StopSignals &) = delete;
-    StopSignals &operator=(const StopSignals &) = delete;
 
 private:
-    class Watch;
-    std::unique_ptr<Watch> _watch;
+    SignalWatch _watch;
 };
 
 } // namespace ZorvaTouch::Host

@@ -51,14 +51,7 @@ TemporaryFolder::~TemporaryFolder() {
 
 // --- The daemon --------------------------------------------------------------------------------------------
 
-DaemonFixture::DaemonFixture() {
-    sigset_t signals;
-    ::sigemptyset(&signals);
-    for (const int number : {SIGTERM, SIGINT, SIGHUP, SIGUSR1})
-        ::sigaddset(&signals, number);
-    ::pthread_sigmask(SIG_BLOCK, &signals, nullptr);
-    options.showsEvents = true;
-}
+DaemonFixture::DaemonFixture() { options.showsEvents = true; }
 
 DaemonFixture::~DaemonFixture() {
     finish();

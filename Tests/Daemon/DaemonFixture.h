@@ -50,7 +50,7 @@ private:
     std::string _path;
 };
 
-/// Signals that end the daemon are blocked in the whole process, whatever thread there is.
+/// Signals reach the daemon from `start` to `finish`; before and after that they end the test.
 class DaemonFixture : public testing::Test {
 protected:
     DaemonFixture();

@@ -28,6 +28,13 @@ def run(*arguments, **more):
     return subprocess.run([PROGRAM, *arguments], text=True, timeout=LONGEST_WAIT_S, check=False, **more)
 
 
+def wait_until(is_so, complaint):
+    deadline = time.monotonic() + LONGEST_WAIT_S
+    while not is_so():
+        if time.monotonic() > deadline:
+            raise AssertionError(complaint)
+
+
 class Running:
     """The daemon while it runs. Its log goes to a file."""
 
@@ -56,10 +63,31 @@ class Running:
 
     def wait_until_it_works(self):
         """For those that have no output: the log says so."""
-        deadline = time.monotonic() + LONGEST_WAIT_S
-        while b"gestures work" not in pathlib.Path(f"/proc/self/fd/{self.log.fileno()}").read_bytes():
-            if time.monotonic() > deadline:
-                raise AssertionError("it does not work")
+        self.wait_for_log("gestures work")
+
+    def log_text(self):
+        return pathlib.Path(f"/proc/self/fd/{self.log.fileno()}").read_text(encoding="utf-8")
+
+    def wait_for_log(self, part):
+        wait_until(lambda: part in self.log_text(), f"the log has no line with {part}")
+
+    def status_field(self, name):
+        for line in pathlib.Path(f"/proc/{self.process.pid}/status").read_text(encoding="utf-8").splitlines():
+            if line.startswith(name + ":"):
+                return line.split()[1]
+        raise AssertionError(f"/proc has no {name}")
+
+    def send_together(self, *numbers):
+        """Signals that are all pending before it serves the first one."""
+        self.process.send_signal(signal.SIGSTOP)
+        wait_until(lambda: self.status_field("State") == "T", "it does not stop")
+        for number in (*numbers, signal.SIGCONT):
+            self.process.send_signal(number)
+
+    def wait_until_taken(self, number):
+        """Until a signal that was sent is no longer pending."""
+        wait_until(lambda: not int(self.status_field("ShdPnd"), 16) & 1 << (number - 1),
+                   "the signal is not taken")
 
     def end_by(self, number):
         """Its status, and how long it took, in seconds."""
@@ -121,7 +149,8 @@ class Finger(unittest.TestCase):
 
 class End(unittest.TestCase):
     def test_each_signal_ends_it_with_0_at_once(self):
-        for number in (signal.SIGTERM, signal.SIGINT, signal.SIGHUP):
+        for number in (signal.SIGTERM, signal.SIGINT, signal.SIGHUP, signal.SIGQUIT, signal.SIGALRM,
+                       signal.SIGUSR2):
             with Running(*ENDLESS) as daemon:
                 daemon.line_with('"opened"')
                 status, seconds = daemon.end_by(number)
@@ -134,6 +163,52 @@ class End(unittest.TestCase):
             daemon.process.send_signal(signal.SIGTERM)
             daemon.line_with('"state":"up"')
             self.assertEqual(daemon.process.wait(LONGEST_WAIT_S), 0)
+
+    def end_with_a_key_down(self, end):
+        """Ends it in the middle of a hold, by a function, with a recording; returns its status, the key lines
+        after that, the names in the recording's directory and the log."""
+        with tempfile.TemporaryDirectory() as folder:
+            file = os.path.join(folder, "touch.json")
+            with Running("--no-keys", "--events", "json", "--accel", "none", "--device", "sim:holds",
+                         "--save", file) as daemon:
+                daemon.line_with('"state":"down"')
+                end(daemon)
+                output = daemon.process.communicate(timeout=LONGEST_WAIT_S)[0]
+                keys = [line["state"] for line in map(json.loads, output.splitlines())
+                        if line["type"] == "key"]
+                return daemon.process.returncode, keys, os.listdir(folder), daemon.log_text()
+
+    def test_a_second_signal_during_the_end_is_acknowledged_and_changes_nothing(self):
+        for pair in ((signal.SIGTERM, signal.SIGHUP), (signal.SIGTERM, signal.SIGINT)):
+            status, keys, files, log = self.end_with_a_key_down(lambda daemon, pair=pair:
+                                                                daemon.send_together(*pair))
+            self.assertEqual((status, keys, files), (0, ["up"], ["touch.json"]), log)
+            self.assertEqual(log.count(": the end is in progress"), 1, log)
+
+    def test_the_same_signal_twice_is_no_more_than_once(self):
+        for number in (signal.SIGINT, signal.SIGHUP):
+            def twice(daemon, number=number):
+                daemon.process.send_signal(number)
+                daemon.wait_until_taken(number)
+                daemon.process.send_signal(number)
+
+            status, keys, files, log = self.end_with_a_key_down(twice)
+            self.assertEqual((status, keys, files), (0, ["up"], ["touch.json"]), log)
+
+    def test_a_third_signal_may_leave_out_recordings_but_never_a_key(self):
+        status, keys, files, log = self.end_with_a_key_down(
+            lambda daemon: daemon.send_together(signal.SIGTERM, signal.SIGHUP, signal.SIGINT))
+        self.assertIn(status, (0, 1), log)
+        self.assertEqual(keys, ["up"], log)
+        self.assertIn(files, ([], ["touch.json"]), log)
+        self.assertIn(": recordings that are not saved yet are left out", log)
+
+    def test_without_a_file_sigusr1_is_answered_in_the_log(self):
+        with Running(*ENDLESS) as daemon:
+            daemon.line_with('"opened"')
+            daemon.process.send_signal(signal.SIGUSR1)
+            daemon.wait_for_log("SIGUSR1: there is no file to save the recording to; start with --save FILE")
+            self.assertEqual(daemon.end_by(signal.SIGTERM)[0], 0)
 
     def test_it_saves_when_told_to_and_goes_on(self):
         with tempfile.TemporaryDirectory() as folder:

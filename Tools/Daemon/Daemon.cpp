@@ -3,13 +3,15 @@
 #include "Host/Linux/RealTime.h"
 #include "Host/Linux/StartUpCode.h"
 #include "Shared/LogNames.h"
+#include "Shared/Util/Ticks.h"
 #include "Tools/Daemon/DaemonChoices.h"
 #include "Tools/Daemon/KeyLines.h"
 #include "Tools/Daemon/PlugInLogs.h"
 #include "Tools/Daemon/RecordingSaver.h"
 
-#include <array>
 #include <csignal>
+#include <cstring>
+#include <new>
 #include <stdexcept>
 #include <system_error>
 #include <utility>
@@ -18,7 +20,6 @@ namespace ZorvaTouch::Tools {
 namespace {
 
 constexpr int kKeyThreadPriority = 63; // as the plug-in's input threads: who hands over must not wait
-constexpr std::array kEndSignals{SIGTERM, SIGINT, SIGHUP};
 constexpr int kSaveSignal = SIGUSR1;
 
 Linux::RateLimitedLogs::Scope scopeFor(Ports::LogLevel level) {
@@ -45,6 +46,7 @@ Daemon::Daemon(const DaemonOptions &options, DaemonSurroundings surroundings)
       _keyboard(options.sendsKeys ? _surroundings.keyboard : nullptr, *_listener, DaemonLog(*_logs, "Keys")),
       _events(Host::EventSystem::create()),
       _recordings(options.saveFile, *_listener, DaemonLog(*_logs, "Recordings")),
+      _signals(kSignals, [this](int signal) { handleSignal(signal); }),
       _surfaces({.plugIn = _surroundings.plugIn,
                  .events = _events,
                  .keyQueue = _keyQueue,
@@ -75,7 +77,6 @@ Daemon::~Daemon() {
 }
 
 std::shared_ptr<Linux::RateLimitedLogs> Daemon::makeLogs() {
-    watchSignals(); // before any thread
     return std::make_shared<Linux::RateLimitedLogs>(
         _surroundings.logs, _surroundings.clock, [this] { _loop.post([this] { flushLogsWhenDue(); }); },
         scopeFor(_options.logLevel));
@@ -109,13 +110,34 @@ void Daemon::checkPlugIn() {
 
 // --- What it hears -----------------------------------------------------------------------------------------
 
-void Daemon::watchSignals() {
-    for (const int signal : kEndSignals)
-        _watches.push_back(_loop.onSignal(signal, [this] { _loop.quit(); }));
-    _watches.push_back(_loop.onSignal(kSaveSignal, [this] {
-        _surfaces.forEach(
-            [this](const SurfaceName &name, const Surface &surface) { _recordings.save(name, surface); });
-    }));
+/// On the signal thread, so that it works also while the main thread saves.
+void Daemon::handleSignal(int signal) noexcept try {
+    if (signal == kSaveSignal)
+        return _loop.post([this] { save(); });
+    const std::string_view name = ::sigabbrev_np(signal);
+    switch (_endRequests.take(
+        Util::TickConverter(_surroundings.clock).nanosecondsFromMachTime(_surroundings.clock.nowTicks()))) {
+    case EndStep::Begin:
+        return _loop.quit();
+    case EndStep::Acknowledge:
+        return _log.notice({"SIG", name,
+                            ": the end is in progress; another signal within 2 s leaves out "
+                            "recordings that are not saved yet"});
+    case EndStep::Hurry:
+        _recordings.giveUp();
+        return _log.notice({"SIG", name, ": recordings that are not saved yet are left out"});
+    case EndStep::Ignore:
+        break;
+    }
+} catch (const std::bad_alloc &) {
+    _log.error({"no memory to save the recording"});
+}
+
+void Daemon::save() {
+    if (!_options.saveFile)
+        return _log.notice({"SIGUSR1: there is no file to save the recording to; start with --save FILE"});
+    _surfaces.forEach(
+        [this](const SurfaceName &name, const Surface &surface) { _recordings.save(name, surface); });
 }
 
 void Daemon::watchAccelerometers() {

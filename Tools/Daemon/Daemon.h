@@ -8,14 +8,18 @@
 #include "Host/Linux/SleepWatch.h"
 #include "Host/Objects/EventSystem.h"
 #include "Host/Runtime/SerialQueue.h"
+#include "Host/Runtime/SignalWatch.h"
 #include "Host/Runtime/StreamWriter.h"
 #include "Tools/Daemon/DaemonOptions.h"
+#include "Tools/Daemon/EndRequests.h"
 #include "Tools/Daemon/Listeners.h"
 #include "Tools/Daemon/RecordingKeeper.h"
 #include "Tools/Daemon/SimulatedSurface.h"
 #include "Tools/Daemon/Surfaces.h"
 #include "Tools/Hosting/SessionPlatform.h"
 
+#include <array>
+#include <csignal>
 #include <functional>
 #include <list>
 #include <memory>
@@ -39,11 +43,16 @@ struct DaemonSurroundings {
 /// The driver: from the surfaces that are there to the keys of one keyboard. It puts the parts together and
 /// lets them hear of each other; what each does is its own affair.
 ///
-/// Threads: the one that makes it, which becomes the main thread, and those of its parts. Signals that it
-/// hears are
-///          blocked from then on.
+/// It ends when it receives SIGTERM, SIGINT, SIGHUP, or another signal that ends programs by default and may
+/// come from outside (`EndRequests.h` describes further ones). SIGUSR1 saves recordings.
+///
+/// Threads: the one that makes it, which becomes the main thread, and those of its parts.
 class Daemon {
 public:
+    /// What it receives. They stay blocked only as long as the daemon exists; a program blocks them for good
+    /// before its first thread, so that a signal during the end does not kill it.
+    static constexpr std::array kSignals{SIGTERM, SIGINT, SIGHUP, SIGQUIT, SIGALRM, SIGUSR1, SIGUSR2};
+
     /// @param options, surroundings  The first is borrowed.
     /// @throws std::runtime_error  It cannot work at all, with the reason in one line.
     Daemon(const DaemonOptions &options, DaemonSurroundings surroundings);
@@ -63,7 +72,8 @@ private:
     /// Of the key thread, 0 if none is allowed.
     [[nodiscard]] int realTimePriority();
 
-    void watchSignals();
+    void handleSignal(int signal) noexcept;
+    void save();
     void watchAccelerometers();
     void startSimulations();
     void watchDevices();
@@ -90,6 +100,8 @@ private:
     Keyboard _keyboard;
     const std::shared_ptr<Host::EventSystem> _events;
     RecordingKeeper _recordings;
+    EndRequests _endRequests; ///< the signal thread's
+    Host::SignalWatch _signals;
     Surfaces _surfaces;
     std::optional<Linux::AccelHub> _accelHub;
     std::optional<Linux::AccelIdentity> _accelerometer; ///< the one that is used

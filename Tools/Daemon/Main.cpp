@@ -2,6 +2,7 @@
 #include "Host/Linux/JournalLogs.h"
 #include "Host/Linux/StandardStreams.h"
 #include "Host/Linux/VirtualKeyboard.h"
+#include "Host/Runtime/Signals.h"
 #include "Host/Runtime/SpdlogLogs.h"
 #include "Host/Runtime/SteadyClock.h"
 #include "Host/Runtime/StreamWriter.h"
@@ -64,6 +65,7 @@ std::string plugInOf(const Tools::DaemonOptions &options) {
 }
 
 int runDaemon(const Tools::DaemonOptions &options) {
+    Host::blockForGood(Tools::Daemon::kSignals); // before any thread
     const auto logs = openLogs(options.logLevel);
     Host::SteadyClock clock;
     Tools::Daemon daemon(

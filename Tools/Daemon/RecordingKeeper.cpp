@@ -29,6 +29,8 @@ void RecordingKeeper::expect(const SurfaceName &name) {
 void RecordingKeeper::save(const SurfaceName &name, const Surface &surface) noexcept {
     if (!_file)
         return;
+    if (_isGivenUp)
+        return _log.error({name.node, ": recording not saved, since a third signal has cut the end short"});
     try {
         Slot &slot = slotOf(name);
         const auto recording = surface.recording();

@@ -4,6 +4,7 @@
 #include "Tools/Daemon/DaemonLog.h"
 #include "Tools/Daemon/Surface.h"
 
+#include <atomic>
 #include <cstddef>
 #include <map>
 #include <optional>
@@ -13,7 +14,7 @@ namespace ZorvaTouch::Tools {
 
 /// Saves surfaces' recordings, each surface's to a file of its own, which it keeps when it is attached anew.
 ///
-/// Threads: the main thread.
+/// Threads: the main thread, but for `giveUp`.
 class RecordingKeeper {
 public:
     /// @param file      Nothing: nothing is saved.
@@ -28,6 +29,11 @@ public:
     /// report does not take the place of one that was saved before.
     void save(const SurfaceName &name, const Surface &surface) noexcept;
 
+    /// From now on `save` saves nothing and logs an error instead; a save in progress is completed.
+    ///
+    /// Threads: any.
+    void giveUp() noexcept { _isGivenUp = true; }
+
 private:
     /// A surface that has or had a recording.
     struct Slot {
@@ -40,6 +46,7 @@ private:
     const std::optional<std::string> _file;
     DaemonListener &_listener;
     const DaemonLog _log;
+    std::atomic<bool> _isGivenUp{false};
     std::map<std::string, Slot> _slots; ///< by the surface's identity
 };
 

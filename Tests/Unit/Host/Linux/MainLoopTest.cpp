@@ -2,7 +2,6 @@
 
 #include <gtest/gtest.h>
 
-#include <csignal>
 #include <stdexcept>
 #include <thread>
 #include <unistd.h>
@@ -90,16 +89,16 @@ TEST_F(MainLoopTest, CallsOnceWhenTheTimeHasCome) {
     EXPECT_EQ(heard, (Numbers{1, 2}));
 }
 
-TEST_F(MainLoopTest, HearsSignals) {
-    const LoopWatch watch = loop.onSignal(SIGUSR1, [&] { loop.quit(); });
-    ::raise(SIGUSR1);
+TEST_F(MainLoopTest, QuitsWhenAnotherThreadAsksBeforeItRuns) {
+    std::thread([&] { loop.quit(); }).join();
     loop.run();
 }
 
-TEST_F(MainLoopTest, LeavesSignalsAloneThatTheProcessIgnores) {
-    ::signal(SIGUSR2, SIG_IGN);
-    EXPECT_FALSE(loop.onSignal(SIGUSR2, [] {}));
-    ::signal(SIGUSR2, SIG_DFL);
+TEST_F(MainLoopTest, QuitsWhenAnotherThreadAsksWhileItRuns) {
+    std::thread other;
+    loop.post([&] { other = std::thread([&] { loop.quit(); }); });
+    loop.run();
+    other.join();
 }
 
 TEST_F(MainLoopTest, EndsWithWhatAFunctionThrows) {
