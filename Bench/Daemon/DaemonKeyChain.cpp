@@ -62,6 +62,7 @@ public:
         const std::size_t count = _link.read(buffer);
         return {.count = count, .errorNumber = count == 0 ? EIO : 0};
     }
+    Linux::IoResult deviceNumber(std::uint64_t &) noexcept override { return {}; }
     Linux::IoResult info(Linux::HidrawInfo &) noexcept override { return {}; }
     Linux::IoResult text(Linux::HidrawText, std::span<std::uint8_t>) noexcept override { return {}; }
     Linux::IoResult reportDescriptor(std::span<std::uint8_t>) noexcept override { return {}; }
@@ -125,7 +126,7 @@ public:
               _surroundings, {.id = "bench", .node = "bench", .name = "bench"},
               [this, &link](const std::shared_ptr<Linux::HidrawObserver> &observer) {
                   _device = Linux::HidrawDevice::create(
-                      [&link](int) { return Linux::OpenedNode{.node = std::make_shared<LinkNode>(link)}; },
+                      [&link] { return Linux::OpenedNode{.node = std::make_shared<LinkNode>(link)}; },
                       observer);
                   return _device;
               },

@@ -34,13 +34,13 @@ const std::string &DeviceIdentity::stableId() const noexcept {
     return physicalPath.empty() ? syspath : physicalPath;
 }
 
-std::optional<HidId> parseHidId(std::string_view text) {
+std::optional<BusHidId> parseHidId(std::string_view text) {
     const auto bus = takeNumber<std::uint32_t>(text, ':');
     const auto vendor = bus ? takeNumber<std::uint16_t>(text, ':') : std::nullopt;
     const auto product = vendor ? takeNumber<std::uint16_t>(text, '\0') : std::nullopt;
     if (!product)
         return std::nullopt;
-    return HidId{*vendor, *product};
+    return BusHidId{*bus, {*vendor, *product}};
 }
 
 std::optional<DeviceIdentity> makeIdentity(std::string devnode, std::string syspath, std::string hidSyspath,
@@ -51,7 +51,8 @@ std::optional<DeviceIdentity> makeIdentity(std::string devnode, std::string sysp
     return DeviceIdentity{.devnode = std::move(devnode),
                           .syspath = std::move(syspath),
                           .hidSyspath = std::move(hidSyspath),
-                          .id = *id,
+                          .bus = id->bus,
+                          .id = id->id,
                           .serial = valueOf(hidProperties, "HID_UNIQ"),
                           .physicalPath = valueOf(hidProperties, "HID_PHYS"),
                           .name = valueOf(hidProperties, "HID_NAME")};

@@ -19,9 +19,11 @@ struct HidId {
 
 /// A HID device and its hidraw node, as the system describes them.
 struct DeviceIdentity {
-    std::string devnode;    ///< "/dev/hidraw0"
-    std::string syspath;    ///< the node's; as long as it is there no other has the same
-    std::string hidSyspath; ///< of the HID device that the node belongs to
+    std::string devnode;            ///< "/dev/hidraw0"
+    std::string syspath;            ///< the node's; as long as it is there no other has the same
+    std::string hidSyspath;         ///< of the HID device that the node belongs to
+    std::uint64_t deviceNumber = 0; ///< the node's `dev_t`; 0: not known
+    std::uint32_t bus = 0;          ///< BUS_USB and its like; 0: not known
     HidId id;
     std::string serial;       ///< may be empty
     std::string physicalPath; ///< where it is attached; may be empty
@@ -37,10 +39,18 @@ struct DeviceIdentity {
 /// Properties of a device as the kernel names them, "HID_NAME".
 using UeventProperties = std::map<std::string, std::string, std::less<>>;
 
+/// What "HID_ID" says.
+struct BusHidId {
+    std::uint32_t bus = 0;
+    HidId id;
+
+    friend bool operator==(const BusHidId &, const BusHidId &) = default;
+};
+
 /// Reads "HID_ID": bus, vendor and product as hexadecimal numbers with colons between, as
 /// "0003:00001234:0000ABCD".
 /// @return Nothing if it is not of that form, or the numbers do not fit.
-[[nodiscard]] std::optional<HidId> parseHidId(std::string_view text);
+[[nodiscard]] std::optional<BusHidId> parseHidId(std::string_view text);
 
 /// Puts an identity together. Texts that are missing are empty.
 /// @param hidProperties  Of the HID device, not of its node.

@@ -2,10 +2,13 @@
 
 #include "Host/Linux/UdevEvents.h"
 
+#include <sys/stat.h>
 #include <unistd.h>
 
+#include <cerrno>
 #include <optional>
 #include <string>
+#include <system_error>
 #include <utility>
 
 namespace ZorvaTouch::Linux {
@@ -32,8 +35,12 @@ std::optional<DeviceIdentity> identityOf(udev_device *node) {
     udev_device *const hid = hidOf(node);
     if (!hid)
         return std::nullopt;
-    return makeIdentity(udevText(::udev_device_get_devnode(node)), udevText(::udev_device_get_syspath(node)),
-                        udevText(::udev_device_get_syspath(hid)), propertiesOf(hid));
+    auto identity =
+        makeIdentity(udevText(::udev_device_get_devnode(node)), udevText(::udev_device_get_syspath(node)),
+                     udevText(::udev_device_get_syspath(hid)), propertiesOf(hid));
+    if (identity)
+        identity->deviceNumber = ::udev_device_get_devnum(node);
+    return identity;
 }
 
 /// Whether a node can be told of: its driver is there, and it may be opened. The driver is there, too, for
@@ -78,6 +85,22 @@ struct DeviceMonitor::Udev {
 
 MonitorSource detectMonitorSource() noexcept {
     return ::access(kUdevdSocket, F_OK) == 0 ? MonitorSource::Udev : MonitorSource::Kernel;
+}
+
+NodeKind nodeKindOf(const std::string &path) {
+    struct stat status {};
+    if (::stat(path.c_str(), &status) != 0) {
+        if (errno == ENOENT)
+            return NodeKind::Missing;
+        throw std::system_error(errno, std::generic_category(), path);
+    }
+    if (!S_ISCHR(status.st_mode))
+        return NodeKind::Other;
+    const UdevOwned<udev> context(::udev_new());
+    const UdevOwned<udev_device> device(
+        context ? ::udev_device_new_from_devnum(context.get(), 'c', status.st_rdev) : nullptr);
+    return device && udevText(::udev_device_get_subsystem(device.get())) == kNodeSubsystem ? NodeKind::Hidraw
+                                                                                           : NodeKind::Other;
 }
 
 DeviceMonitor::DeviceMonitor(DeviceFilter wanted, DeviceListener &listener, MonitorSource source)

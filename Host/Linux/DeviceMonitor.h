@@ -16,6 +16,18 @@ enum class MonitorSource {
 /// `Udev` where udevd runs.
 [[nodiscard]] MonitorSource detectMonitorSource() noexcept;
 
+/// What is under a path.
+enum class NodeKind {
+    Missing,
+    Hidraw, ///< a hidraw device node, or a link to one
+    Other,
+};
+
+/// Opens nothing.
+/// @throws std::system_error  The path cannot be examined; `what` begins with it.
+/// @throws std::bad_alloc
+[[nodiscard]] NodeKind nodeKindOf(const std::string &path);
+
 /// Finds hidraw devices of some makes, those that are there and those that come, and tells when they go.
 ///
 /// Threads: one at a time; the listener is called on the one that calls.

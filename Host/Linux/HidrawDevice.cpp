@@ -3,8 +3,6 @@
 #include "Host/Interface/Platform.h"
 #include "Host/Linux/HidrawProperties.h"
 
-#include <fcntl.h>
-
 #include <algorithm>
 #include <array>
 #include <cerrno>
@@ -117,12 +115,12 @@ void HidrawDevice::lose(std::shared_ptr<HidrawNode> node, const SystemFailure &r
 ZorvaStatus HidrawDevice::open() {
     if (currentNode())
         return ZORVA_STATUS_SUCCESS;
-    const OpenedNode opened = openNode();
+    const OpenedNode opened = _opener();
     if (!opened.node)
-        return refuse(opened.errorNumber);
+        return refuse({"open", opened.errorNumber, opened.detail});
     PropertyValue::Dictionary properties;
     if (const int errorNumber = readProperties(*opened.node, properties))
-        return refuse(errorNumber);
+        return refuse({"open", errorNumber});
     {
         MutexLock lock(_lock);
         _source.disconnect();
@@ -133,21 +131,13 @@ ZorvaStatus HidrawDevice::open() {
             return ZORVA_STATUS_SUCCESS;
         _node.reset();
     }
-    return refuse(ENOMEM);
+    return refuse({"open", ENOMEM});
 }
 
-OpenedNode HidrawDevice::openNode() const {
-    OpenedNode opened = _opener(O_RDWR | O_NONBLOCK);
-    // To read reports, and feature reports too, is all that is needed.
-    if (!opened.node && (opened.errorNumber == EACCES || opened.errorNumber == EROFS))
-        opened = _opener(O_RDONLY | O_NONBLOCK);
-    return opened;
-}
-
-ZorvaStatus HidrawDevice::refuse(int errorNumber) const noexcept {
+ZorvaStatus HidrawDevice::refuse(const SystemFailure &failure) const noexcept {
     if (_observer)
-        _observer->onFailure({"open", errorNumber});
-    return isAbsent(errorNumber) ? kStatusNoDevice : ZORVA_STATUS_NO_RESOURCES;
+        _observer->onFailure(failure);
+    return isAbsent(failure.errorNumber) ? kStatusNoDevice : ZORVA_STATUS_NO_RESOURCES;
 }
 
 void HidrawDevice::close() noexcept {

@@ -88,8 +88,7 @@ private:
     ~HidrawDevice() = default;
 
     ZorvaStatus open();
-    [[nodiscard]] OpenedNode openNode() const;
-    ZorvaStatus refuse(int errorNumber) const noexcept;
+    ZorvaStatus refuse(const SystemFailure &failure) const noexcept;
     void close() noexcept;
     void setCallback(const Callback &callback) noexcept;
     void schedule(ZorvaRunLoop *loop, const char *mode);

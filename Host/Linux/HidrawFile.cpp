@@ -3,6 +3,7 @@
 #include <fcntl.h>
 #include <linux/hidraw.h>
 #include <sys/ioctl.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -36,8 +37,8 @@ unsigned long textRequest(HidrawText which, std::size_t size) noexcept {
 
 } // namespace
 
-OpenedNode HidrawFile::open(const std::string &path, int flags) noexcept {
-    UniqueFd descriptor(::open(path.c_str(), flags | O_CLOEXEC));
+OpenedNode HidrawFile::open(const std::string &path) noexcept {
+    UniqueFd descriptor(::open(path.c_str(), O_RDONLY | O_NONBLOCK | O_NOCTTY | O_CLOEXEC));
     if (!descriptor)
         return {.node = nullptr, .errorNumber = errno};
     try {
@@ -48,11 +49,21 @@ OpenedNode HidrawFile::open(const std::string &path, int flags) noexcept {
 }
 
 HidrawOpener HidrawFile::opener(std::string path) {
-    return [path = std::move(path)](int flags) { return open(path, flags); };
+    return [path = std::move(path)] { return open(path); };
 }
 
 IoResult HidrawFile::read(std::span<std::uint8_t> buffer) noexcept {
     return resultOf(::read(descriptor(), buffer.data(), buffer.size()));
+}
+
+IoResult HidrawFile::deviceNumber(std::uint64_t &stored) noexcept {
+    struct stat status {};
+    if (::fstat(descriptor(), &status) != 0)
+        return {.errorNumber = errno};
+    if (!S_ISCHR(status.st_mode))
+        return {.errorNumber = ENOTTY};
+    stored = status.st_rdev;
+    return {};
 }
 
 IoResult HidrawFile::info(HidrawInfo &stored) noexcept {

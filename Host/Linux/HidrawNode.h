@@ -41,6 +41,8 @@ public:
     /// A count of 0 is the end. The buffer must not be empty.
     [[nodiscard]] virtual IoResult read(std::span<std::uint8_t> buffer) noexcept = 0;
 
+    /// Stores the node's `dev_t`. ENOTTY: it is not a character device.
+    [[nodiscard]] virtual IoResult deviceNumber(std::uint64_t &stored) noexcept = 0;
     [[nodiscard]] virtual IoResult info(HidrawInfo &stored) noexcept = 0;
     /// Stores the text with its NUL, or as much as fits without.
     [[nodiscard]] virtual IoResult text(HidrawText which, std::span<std::uint8_t> buffer) noexcept = 0;
@@ -56,9 +58,10 @@ public:
 struct OpenedNode {
     std::shared_ptr<HidrawNode> node; ///< null: it failed
     int errorNumber = 0;              ///< why it failed
+    const char *detail = nullptr;     ///< as in `SystemFailure`
 };
 
-/// Opens a node with flags of `open`. Does not throw.
-using HidrawOpener = std::function<OpenedNode(int flags)>;
+/// Opens a node, for reading only and without blocking. Does not throw.
+using HidrawOpener = std::function<OpenedNode()>;
 
 } // namespace ZorvaTouch::Linux

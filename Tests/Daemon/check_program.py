@@ -117,6 +117,23 @@ class Usage(unittest.TestCase):
         self.assertEqual(len(errors), 1, done.stderr)
         self.assertIn("/nowhere/plugin.so", errors[0])
 
+    def test_a_device_that_is_something_else_is_one_line_and_status_1(self):
+        with tempfile.TemporaryDirectory() as folder:
+            fifo = os.path.join(folder, "fifo")
+            os.mkfifo(fifo)
+            for device in ("/etc/passwd", "/dev/null", fifo):
+                for more in ([], ["--describe"]):
+                    done = run("--device", device, *more)
+                    self.assertEqual((done.returncode, done.stdout), (1, ""), device)
+                    self.assertIn(f"zorvatouchd: {device}: must be a hidraw device node, as /dev/hidraw0 is\n",
+                                  done.stderr)
+
+    def test_a_device_that_does_not_exist_is_waited_for_and_named(self):
+        device = "/dev/no-such-hidraw"
+        with Running("--no-keys", "--device", device) as daemon:
+            daemon.wait_for_log(f"{device}: does not exist yet; waiting for it")
+            self.assertEqual(daemon.end_by(signal.SIGTERM)[0], 0)
+
     def test_answers_do_without_anybody_who_reads_them(self):
         with open("/dev/full", "w", encoding="ascii") as full:
             self.assertIn(run("--version", stdout=full).returncode, (0, 1))

@@ -60,6 +60,7 @@ Daemon::Daemon(const DaemonOptions &options, DaemonSurroundings surroundings)
                 {.onComing = [this](const SurfaceName &name) { _recordings.expect(name); },
                  .onEnding = [this](const SurfaceName &name,
                                     const Surface &surface) { _recordings.save(name, surface); }}) {
+    requireNodes(deviceFilterOf(_options));
     if (_options.saveFile)
         requireSavable(*_options.saveFile); // rather now than when it is too late
     checkPlugIn();
@@ -193,12 +194,17 @@ void Daemon::watchDevices() {
         _deviceMonitor->receive();
     }));
     _deviceMonitor->scan();
-    if (_surfaces.count() != 0)
-        return;
+    logMissingDevices(filter);
+}
+
+void Daemon::logMissingDevices(const Linux::DeviceFilter &filter) {
     for (const std::string &node : filter.nodes)
-        _log.notice({node, ": no surface is there yet"});
-    if (filter.nodes.empty())
-        _log.notice({"no surface is there yet"});
+        if (Linux::nodeKindOf(node) == Linux::NodeKind::Missing)
+            _log.notice({node, ": does not exist yet; waiting for it"});
+        else if (_surfaces.count() == 0)
+            _log.notice({node, ": not ready yet; waiting for it"});
+    if (filter.nodes.empty() && _surfaces.count() == 0)
+        _log.notice({"no touch surface found; waiting for one"});
 }
 
 void Daemon::watchSleep() {

@@ -77,6 +77,7 @@ private:
     void watchAccelerometers();
     void startSimulations();
     void watchDevices();
+    void logMissingDevices(const Linux::DeviceFilter &filter);
     void watchSleep();
 
     [[nodiscard]] Ref<Host::Accelerometer> simulatedAccelerometer();

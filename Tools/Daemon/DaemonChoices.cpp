@@ -1,5 +1,8 @@
 #include "Tools/Daemon/DaemonChoices.h"
 
+#include "Host/Linux/DeviceMonitor.h"
+
+#include <stdexcept>
 #include <string>
 #include <variant>
 
@@ -13,6 +16,12 @@ Linux::DeviceFilter deviceFilterOf(const DaemonOptions &options) {
         if (const auto *const path = std::get_if<std::string>(&device))
             filter.nodes.push_back(*path);
     return filter;
+}
+
+void requireNodes(const Linux::DeviceFilter &filter) {
+    for (const std::string &node : filter.nodes)
+        if (Linux::nodeKindOf(node) == Linux::NodeKind::Other)
+            throw std::runtime_error(node + ": must be a hidraw device node, as /dev/hidraw0 is");
 }
 
 Linux::AccelChoice accelChoiceOf(const AccelOption &option) {

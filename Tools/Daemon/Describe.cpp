@@ -81,7 +81,9 @@ PropertyValue describeSurface(const Linux::DeviceIdentity &device, const std::st
 PropertyValue describeSurfaces(const DaemonOptions &options, const std::string &plugIn,
                                const DeviceFinder &finder, const std::function<void(std::string_view)> &say) {
     Found<Linux::DeviceListener, Linux::DeviceIdentity> found;
-    Linux::DeviceMonitor(deviceFilterOf(options), found).scan();
+    const Linux::DeviceFilter filter = deviceFilterOf(options);
+    requireNodes(filter);
+    Linux::DeviceMonitor(filter, found).scan();
     PropertyValue::Array all;
     for (const Linux::DeviceIdentity &device : found.all) {
         say("asking " + device.devnode + " for its reports; one that does not answer takes a minute");

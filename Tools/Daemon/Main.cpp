@@ -1,4 +1,5 @@
 #include "Host/Linux/HidrawFile.h"
+#include "Host/Linux/HidrawOpeners.h"
 #include "Host/Linux/JournalLogs.h"
 #include "Host/Linux/StandardStreams.h"
 #include "Host/Linux/VirtualKeyboard.h"
@@ -55,8 +56,9 @@ std::unique_ptr<Ports::LogProvider> openLogs(Ports::LogLevel level) {
 }
 
 Tools::DeviceMaker hidrawDevice(const Linux::DeviceIdentity &device) {
-    return [node = device.devnode](const std::shared_ptr<Linux::HidrawObserver> &observer) {
-        return Linux::HidrawDevice::create(Linux::HidrawFile::opener(node), observer);
+    return [device](const std::shared_ptr<Linux::HidrawObserver> &observer) {
+        return Linux::HidrawDevice::create(Linux::openOnly(device, Linux::HidrawFile::opener(device.devnode)),
+                                           observer);
     };
 }
 

@@ -292,7 +292,7 @@ class Surface(Emulated):
 def start(*arguments, **settings):
     """(daemon, its keys): a daemon without any surface yet."""
     daemon = Daemon(*arguments, **settings)
-    daemon.log.wait("no surface is there yet")
+    daemon.log.wait("no touch surface found; waiting for one")
     return daemon, Keys()
 
 

@@ -16,9 +16,9 @@ using testing::IsEmpty;
 // ----------------------------------------------------------------------------------------------
 
 TEST(HidIds, AreReadFromTheKernelsText) {
-    EXPECT_EQ(parseHidId("0003:00001234:0000ABCD"), (HidId{0x1234, 0xABCD}));
-    EXPECT_EQ(parseHidId("0006:0000ffff:00000000"), (HidId{0xFFFF, 0}));
-    EXPECT_EQ(parseHidId("3:1:2"), (HidId{1, 2}));
+    EXPECT_EQ(parseHidId("0003:00001234:0000ABCD"), (BusHidId{3, {0x1234, 0xABCD}}));
+    EXPECT_EQ(parseHidId("0006:0000ffff:00000000"), (BusHidId{6, {0xFFFF, 0}}));
+    EXPECT_EQ(parseHidId("3:1:2"), (BusHidId{3, {1, 2}}));
 }
 
 TEST(HidIds, AreNothingElse) {
@@ -41,6 +41,7 @@ TEST(DeviceIdentities, ArePutTogetherFromProperties) {
     EXPECT_EQ(identity->devnode, "/dev/hidraw3");
     EXPECT_EQ(identity->syspath, "/sys/h/hidraw/hidraw3");
     EXPECT_EQ(identity->hidSyspath, "/sys/h");
+    EXPECT_EQ(identity->bus, 3u);
     EXPECT_EQ(identity->id, (HidId{0x1234, 0xABCD}));
     EXPECT_EQ(identity->name, "Zorva Touch");
     EXPECT_EQ(identity->physicalPath, "usb-1/input0");

@@ -50,6 +50,12 @@ IoResult FakeNode::read(std::span<std::uint8_t> buffer) noexcept {
     return {.count = static_cast<std::size_t>(count)};
 }
 
+IoResult FakeNode::deviceNumber(std::uint64_t &stored) noexcept {
+    if (numberError == 0)
+        stored = number;
+    return {.errorNumber = numberError};
+}
+
 IoResult FakeNode::info(HidrawInfo &stored) noexcept {
     if (infoError == 0)
         stored = hidrawInfo;
@@ -71,8 +77,8 @@ IoResult FakeNode::featureReport(std::span<std::uint8_t> buffer) noexcept {
     return onFeature ? onFeature(buffer) : IoResult{.errorNumber = EIO};
 }
 
-OpenedNode FakeOpener::open(int wanted) {
-    flags.push_back(wanted);
+OpenedNode FakeOpener::open() {
+    ++opens;
     if (!errors.empty()) {
         const int errorNumber = errors.front();
         errors.pop_front();

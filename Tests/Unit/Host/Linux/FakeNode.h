@@ -26,6 +26,7 @@ public:
 
     [[nodiscard]] int descriptor() const noexcept override { return _near.get(); }
     [[nodiscard]] IoResult read(std::span<std::uint8_t> buffer) noexcept override;
+    [[nodiscard]] IoResult deviceNumber(std::uint64_t &stored) noexcept override;
     [[nodiscard]] IoResult info(HidrawInfo &stored) noexcept override;
     [[nodiscard]] IoResult text(HidrawText which, std::span<std::uint8_t> buffer) noexcept override;
     [[nodiscard]] IoResult reportDescriptor(std::span<std::uint8_t> buffer) noexcept override;
@@ -35,6 +36,8 @@ public:
     int endError = 5;           ///< EIO; 0: the end is an empty read
     unsigned reads = 0;
 
+    std::uint64_t number = 0xF300; ///< the node's
+    int numberError = 0;
     int infoError = 0, textError = 0, descriptorError = 0;
     HidrawInfo hidrawInfo{.bus = 3, .vendor = 0x1234, .product = 0xABCD};
     Bytes name{'T', 'o', 'u', 'c', 'h', 0}, uniqueId{'S', 'N', '1', 0},
@@ -47,17 +50,17 @@ private:
     UniqueFd _near, _far;
 };
 
-/// Hands out fake nodes and notes how they were asked for.
+/// Hands out fake nodes and counts how often it was asked.
 class FakeOpener {
 public:
     [[nodiscard]] HidrawOpener opener() {
-        return [this](int wanted) { return open(wanted); };
+        return [this] { return open(); };
     }
-    [[nodiscard]] OpenedNode open(int wanted);
+    [[nodiscard]] OpenedNode open();
     /// The node that was handed out last; null once it was closed.
     [[nodiscard]] std::shared_ptr<FakeNode> node() const { return _last.lock(); }
 
-    std::vector<int> flags;
+    unsigned opens = 0;
     std::deque<int> errors; ///< what the next opens fail with; 0: not at all
     std::function<void(FakeNode &)> prepare;
 

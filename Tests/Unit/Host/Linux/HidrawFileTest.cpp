@@ -3,9 +3,11 @@
 #include <gtest/gtest.h>
 
 #include <fcntl.h>
+#include <sys/sysmacros.h>
 
 #include <array>
 #include <cerrno>
+#include <cstdint>
 
 namespace ZorvaTouch::Linux {
 namespace {
@@ -14,33 +16,41 @@ namespace {
 // which refuses them.
 
 TEST(HidrawFile, SaysWhyItCannotBeOpened) {
-    const OpenedNode opened = HidrawFile::open("/dev/no-such-node", O_RDWR | O_NONBLOCK);
+    const OpenedNode opened = HidrawFile::open("/dev/no-such-node");
     EXPECT_EQ(opened.node, nullptr);
     EXPECT_EQ(opened.errorNumber, ENOENT);
-    EXPECT_EQ(HidrawFile::open("/dev/null/hidraw0", O_RDONLY).errorNumber, ENOTDIR);
+    EXPECT_EQ(HidrawFile::open("/dev/null/hidraw0").errorNumber, ENOTDIR);
 }
 
-TEST(HidrawFile, IsNotInheritedByProgramsThatAreStarted) {
-    const OpenedNode opened = HidrawFile::opener("/dev/null")(O_RDWR | O_NONBLOCK);
+TEST(HidrawFile, IsOpenedForReadingOnlyAndIsNotInherited) {
+    const OpenedNode opened = HidrawFile::opener("/dev/null")();
     ASSERT_NE(opened.node, nullptr);
     EXPECT_EQ(::fcntl(opened.node->descriptor(), F_GETFD) & FD_CLOEXEC, FD_CLOEXEC);
-    EXPECT_EQ(::fcntl(opened.node->descriptor(), F_GETFL) & (O_ACCMODE | O_NONBLOCK), O_RDWR | O_NONBLOCK);
+    EXPECT_EQ(::fcntl(opened.node->descriptor(), F_GETFL) & (O_ACCMODE | O_NONBLOCK), O_RDONLY | O_NONBLOCK);
 }
 
 TEST(HidrawFile, ReadsWhatComes) {
     std::array<std::uint8_t, 4> buffer{1, 2, 3, 4};
-    IoResult result = HidrawFile::open("/dev/zero", O_RDONLY).node->read(buffer);
+    IoResult result = HidrawFile::open("/dev/zero").node->read(buffer);
     EXPECT_EQ(result.errorNumber, 0);
     EXPECT_EQ(result.count, 4u);
     EXPECT_EQ(buffer, (std::array<std::uint8_t, 4>{}));
-    result = HidrawFile::open("/dev/null", O_RDONLY).node->read(buffer);
+    result = HidrawFile::open("/dev/null").node->read(buffer);
     EXPECT_EQ(result.errorNumber, 0);
     EXPECT_EQ(result.count, 0u) << "the end";
-    EXPECT_EQ(HidrawFile::open("/", O_RDONLY).node->read(buffer).errorNumber, EISDIR);
+    EXPECT_EQ(HidrawFile::open("/").node->read(buffer).errorNumber, EISDIR);
+}
+
+TEST(HidrawFile, HasADeviceNumberIfItIsACharacterDevice) {
+    std::uint64_t number = 0;
+    EXPECT_EQ(HidrawFile::open("/dev/null").node->deviceNumber(number).errorNumber, 0);
+    EXPECT_EQ(number, makedev(1, 3));
+    EXPECT_EQ(HidrawFile::open("/").node->deviceNumber(number).errorNumber, ENOTTY);
+    EXPECT_EQ(HidrawFile::open("/etc/passwd").node->deviceNumber(number).errorNumber, ENOTTY);
 }
 
 TEST(HidrawFile, OfNoHidDeviceAnswersNothing) {
-    const OpenedNode opened = HidrawFile::open("/dev/null", O_RDWR);
+    const OpenedNode opened = HidrawFile::open("/dev/null");
     std::array<std::uint8_t, 64> buffer{4};
     HidrawInfo info;
     EXPECT_EQ(opened.node->info(info).errorNumber, ENOTTY);

@@ -3,6 +3,9 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <stdexcept>
+#include <string>
+
 namespace ZorvaTouch::Tools {
 namespace {
 
@@ -33,6 +36,23 @@ TEST(DaemonChoices, NodesThatAreNamedAreTheOnlyOnes) {
     EXPECT_THAT(deviceFilterOf(options).ids, IsEmpty());
     EXPECT_THAT(deviceFilterOf(options).nodes, ElementsAre("/dev/hidraw3", "/dev/touch"));
 }
+
+std::string refusalOf(const std::string &node) {
+    try {
+        requireNodes({.ids = {}, .nodes = {node}});
+        return {};
+    } catch (const std::runtime_error &error) {
+        return error.what();
+    }
+}
+
+TEST(DaemonChoices, ANodeThatIsSomethingElseIsRefused) {
+    for (const std::string node : {"/etc/passwd", "/dev/null", "/dev"})
+        EXPECT_EQ(refusalOf(node), node + ": must be a hidraw device node, as /dev/hidraw0 is");
+    EXPECT_EQ(refusalOf("/dev/null/hidraw0"), "/dev/null/hidraw0: Not a directory");
+}
+
+TEST(DaemonChoices, ANodeThatDoesNotExistYetIsNot) { EXPECT_EQ(refusalOf("/dev/no-such-node"), ""); }
 
 TEST(DaemonChoices, SimulatedOnesAloneAskTheSystemForNothing) {
     DaemonOptions options;
