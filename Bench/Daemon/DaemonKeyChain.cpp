@@ -63,6 +63,7 @@ public:
         return {.count = count, .errorNumber = count == 0 ? EIO : 0};
     }
     Linux::IoResult deviceNumber(std::uint64_t &) noexcept override { return {}; }
+    Linux::IoResult lock() noexcept override { return {}; }
     Linux::IoResult info(Linux::HidrawInfo &) noexcept override { return {}; }
     Linux::IoResult text(Linux::HidrawText, std::span<std::uint8_t>) noexcept override { return {}; }
     Linux::IoResult reportDescriptor(std::span<std::uint8_t>) noexcept override { return {}; }

@@ -2,6 +2,7 @@
 
 #include <fcntl.h>
 #include <linux/hidraw.h>
+#include <sys/file.h>
 #include <sys/ioctl.h>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -65,6 +66,8 @@ IoResult HidrawFile::deviceNumber(std::uint64_t &stored) noexcept {
     stored = status.st_rdev;
     return {};
 }
+
+IoResult HidrawFile::lock() noexcept { return resultOf(::flock(descriptor(), LOCK_EX | LOCK_NB)); }
 
 IoResult HidrawFile::info(HidrawInfo &stored) noexcept {
     hidraw_devinfo info{};

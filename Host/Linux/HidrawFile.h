@@ -23,6 +23,9 @@ public:
     [[nodiscard]] int descriptor() const noexcept override { return _descriptor.get(); }
     [[nodiscard]] IoResult read(std::span<std::uint8_t> buffer) noexcept override;
     [[nodiscard]] IoResult deviceNumber(std::uint64_t &stored) noexcept override;
+    /// An advisory lock (`flock`) on the node's inode: it works for whoever may open the node, across users
+    /// and containers that share the node, and needs no other file.
+    [[nodiscard]] IoResult lock() noexcept override;
     [[nodiscard]] IoResult info(HidrawInfo &stored) noexcept override;
     [[nodiscard]] IoResult text(HidrawText which, std::span<std::uint8_t> buffer) noexcept override;
     [[nodiscard]] IoResult reportDescriptor(std::span<std::uint8_t> buffer) noexcept override;

@@ -43,6 +43,9 @@ public:
 
     /// Stores the node's `dev_t`. ENOTTY: it is not a character device.
     [[nodiscard]] virtual IoResult deviceNumber(std::uint64_t &stored) noexcept = 0;
+    /// Locks the node until it is closed, which the kernel does when the process ends in whatever way.
+    /// EWOULDBLOCK: another open node is locked; never blocks.
+    [[nodiscard]] virtual IoResult lock() noexcept = 0;
     [[nodiscard]] virtual IoResult info(HidrawInfo &stored) noexcept = 0;
     /// Stores the text with its NUL, or as much as fits without.
     [[nodiscard]] virtual IoResult text(HidrawText which, std::span<std::uint8_t> buffer) noexcept = 0;

@@ -16,6 +16,13 @@ OpenedNode refusal(int errorNumber, const char *detail) noexcept {
 }
 
 /// @param errorNumber  Of the call that does not work: a device that is just going fails with ENODEV.
+OpenedNode lock(OpenedNode opened) noexcept {
+    const int errorNumber = opened.node->lock().errorNumber;
+    if (errorNumber == EWOULDBLOCK)
+        return refusal(EBUSY, "in use by another program");
+    return errorNumber == 0 ? opened : refusal(errorNumber, nullptr);
+}
+
 OpenedNode notHidraw(int errorNumber) noexcept {
     if (errorNumber == ENODEV)
         return refusal(ENODEV, nullptr);
@@ -68,6 +75,13 @@ HidrawOpener openOnly(DeviceIdentity device, HidrawOpener opener) {
     return [device = std::move(device), opener = std::move(opener)]() noexcept {
         OpenedNode opened = opener();
         return opened.node ? check(std::move(opened), device) : opened;
+    };
+}
+
+HidrawOpener openLocked(HidrawOpener opener) {
+    return [opener = std::move(opener)]() noexcept {
+        OpenedNode opened = opener();
+        return opened.node ? lock(std::move(opened)) : opened;
     };
 }
 

@@ -18,4 +18,9 @@ namespace ZorvaTouch::Linux {
 /// @throws std::bad_alloc  Only now; the opener that is returned does not throw.
 [[nodiscard]] HidrawOpener openOnly(DeviceIdentity device, HidrawOpener opener);
 
+/// Opens a node and locks it, so that of several programs that do so one has it. EBUSY: another program has
+/// locked it.
+/// @throws std::bad_alloc  Only now; the opener that is returned does not throw.
+[[nodiscard]] HidrawOpener openLocked(HidrawOpener opener);
+
 } // namespace ZorvaTouch::Linux

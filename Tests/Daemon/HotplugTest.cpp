@@ -116,6 +116,38 @@ TEST_F(DaemonHotplug, UsesWhatIsThereWhenItStarts) {
     EXPECT_EQ(node("1"), nullptr);
 }
 
+TEST_F(DaemonHotplug, EndsWhenAnotherProgramUsesASurface) {
+    plug("1", "SN1");
+    openers.at("/dev/hidraw1").errors = {EBUSY};
+    start();
+    try {
+        daemon->run();
+        ADD_FAILURE() << "it serves";
+    } catch (const SurfaceInUse &error) {
+        EXPECT_STREQ(error.what(),
+                     "/dev/hidraw1: another program uses it; end that, or wait for it with --wait");
+    }
+}
+
+TEST_F(DaemonHotplug, WaitsForASurfaceThatAnotherProgramUsesIfTold) {
+    options.waits = true;
+    plug("1", "SN1");
+    openers.at("/dev/hidraw1").errors = {EBUSY};
+    start();
+    runWhile([this] { waitForState("opened", 1); });
+    EXPECT_THAT(surfaces(), ElementsAre("added SN1", "failed SN1", "opened SN1"));
+}
+
+TEST_F(DaemonHotplug, OneThatComesLaterAndIsUsedIsTriedAgain) {
+    openers.at("/dev/hidraw1").errors = {EBUSY};
+    start();
+    runWhile([this] {
+        plug("1", "SN1");
+        waitForState("opened", 1);
+    });
+    EXPECT_THAT(surfaces(), ElementsAre("added SN1", "failed SN1", "opened SN1"));
+}
+
 TEST_F(DaemonHotplug, WaitsForTheDriverAndThenOpens) {
     start();
     EXPECT_EQ(logs.lines().count("Daemon: no touch surface found; waiting for one"), 1u);

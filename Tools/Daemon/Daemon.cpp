@@ -253,7 +253,16 @@ void Daemon::finishSimulation() {
 
 // --- Serving -----------------------------------------------------------------------------------------------
 
+/// Two daemons would press every key twice. Surfaces that are attached later are retried instead: a daemon
+/// that works does not end because another program was faster.
+void Daemon::requireOwnSurfaces() const {
+    const SurfaceName *const surface = _options.waits ? nullptr : _surfaces.inUse();
+    if (surface)
+        throw SurfaceInUse(surface->node + ": another program uses it; end that, or wait for it with --wait");
+}
+
 void Daemon::run() {
+    requireOwnSurfaces();
     Linux::releaseStartUpCode(); // or it would be locked
     if (const auto refusal = Linux::lockMemory())
         _log.notice({refusal->line});

@@ -62,6 +62,8 @@ public:
     Daemon &operator=(const Daemon &) = delete;
 
     /// Serves until a signal, or until all that was simulated has been played.
+    /// @throws SurfaceInUse  Another program uses one of the surfaces that were there at the start, and the
+    ///                       options do not say to wait for it.
     /// @throws std::runtime_error
     void run();
 
@@ -77,6 +79,7 @@ private:
     void watchAccelerometers();
     void startSimulations();
     void watchDevices();
+    void requireOwnSurfaces() const;
     void logMissingDevices(const Linux::DeviceFilter &filter);
     void watchSleep();
 

@@ -41,6 +41,7 @@ Exit status:
   0  ended by a signal, or with the simulated finger
   1  the plug-in cannot be loaded, or nothing can work
   2  bad usage
+  3  another program uses a surface, as a second zorvatouchd does; see --wait
 )";
 
 [[noreturn]] void refuse(std::string_view option, std::string_view text, const std::string &problem) {
@@ -187,6 +188,7 @@ private:
         addOptions(kGroup, "--id", _ids, "VENDOR:PRODUCT",
                    "Look for this make, in hexadecimal digits. May be repeated\n"
                    "Those that are given take the place of 1234:ABCD");
+        addFlag(kGroup, "--wait", _wait, "Wait for surfaces that another daemon uses");
         addOption(kGroup, "--accel", _accel, "NAME",
                   "Which accelerometer to use; auto unless given\n"
                   "auto          any that is there\n"
@@ -303,6 +305,7 @@ private:
             refuse("--events", *_events, "no format; there is json");
         options.showsEvents = _events.has_value();
         options.sendsKeys = !_noKeys;
+        options.waits = _wait;
         options.describe = _describe;
         if (_save)
             requireFileName("--save", *_save);
@@ -320,6 +323,7 @@ private:
             {"--save", _save.has_value()},
             {"--no-keys", _noKeys},
             {"--duration", _duration.has_value()},
+            {"--wait", _wait},
         };
         for (const auto &[name, isGiven] : others)
             if (_describe && isGiven)
@@ -330,7 +334,7 @@ private:
     // As typed.
     std::vector<std::string> _devices, _ids, _maps;
     std::optional<std::string> _seed, _duration, _accel, _events, _save, _logLevel, _plugIn;
-    bool _noKeys = false, _describe = false;
+    bool _noKeys = false, _describe = false, _wait = false;
 };
 
 } // namespace

@@ -38,6 +38,7 @@ struct DaemonOptions {
     KeyMap keys;
     bool sendsKeys = true;    ///< or shows them
     bool showsEvents = false; ///< as lines of JSON
+    bool waits = false;       ///< for surfaces that another program uses, rather than ending
     bool describe = false;    ///< says what is there, and that is all
     std::optional<std::string> saveFile;
     Ports::LogLevel logLevel = Ports::LogLevel::Default;

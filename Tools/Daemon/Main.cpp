@@ -25,7 +25,7 @@ namespace {
 
 using namespace ZorvaTouch;
 
-enum ExitStatus { kExitEnded = 0, kExitFailed = 1, kExitWrongUsage = 2 };
+enum ExitStatus { kExitEnded = 0, kExitFailed = 1, kExitWrongUsage = 2, kExitInUse = 3 };
 
 /// The log as text on standard error, by way of a thread of its own: whoever reads it, a terminal that is
 /// stopped say, keeps no key waiting.
@@ -55,10 +55,13 @@ std::unique_ptr<Ports::LogProvider> openLogs(Ports::LogLevel level) {
     return std::make_unique<TextLogs>(level);
 }
 
-Tools::DeviceMaker hidrawDevice(const Linux::DeviceIdentity &device) {
-    return [device](const std::shared_ptr<Linux::HidrawObserver> &observer) {
-        return Linux::HidrawDevice::create(Linux::openOnly(device, Linux::HidrawFile::opener(device.devnode)),
-                                           observer);
+Linux::HidrawOpener openerOf(const Linux::DeviceIdentity &device) {
+    return Linux::openOnly(device, Linux::HidrawFile::opener(device.devnode));
+}
+
+Tools::DeviceMaker makerFor(Linux::HidrawOpener opener) {
+    return [opener = std::move(opener)](const std::shared_ptr<Linux::HidrawObserver> &observer) {
+        return Linux::HidrawDevice::create(opener, observer);
     };
 }
 
@@ -78,7 +81,9 @@ int runDaemon(const Tools::DaemonOptions &options) {
          .output = std::make_shared<Host::StreamWriter>(Host::StandardStream::Output),
          .usesColour = Host::showsColours(Host::StandardStream::Output),
          .keyboard = [codes = options.keys.codes()] { return Linux::VirtualKeyboard::create(codes); },
-         .finder = hidrawDevice});
+         .finder = [](const Linux::DeviceIdentity &device) {
+             return makerFor(Linux::openLocked(openerOf(device)));
+         }});
     daemon.run();
     return kExitEnded;
 }
@@ -122,6 +127,8 @@ int main(int argc, char **argv) {
         return options.describe ? describe(options) : runDaemon(options);
     } catch (const Tools::CliError &error) {
         return fail(error, kExitWrongUsage);
+    } catch (const Tools::SurfaceInUse &error) {
+        return fail(error, kExitInUse);
     } catch (const std::exception &error) {
         return fail(error, kExitFailed);
     }

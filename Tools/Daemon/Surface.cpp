@@ -27,9 +27,12 @@ Surface::Surface(SurfaceSurroundings &surroundings, const SurfaceName &name, con
     try {
         _service->start(Host::Service::create(maker(_observer), surroundings.events).get());
     } catch (const HostingError &) {
-        if (const auto failure = _observer->openFailure())
-            throw std::runtime_error(describe(*failure).append(adviceFor(*failure)));
-        throw;
+        const auto failure = _observer->openFailure();
+        if (!failure)
+            throw;
+        if (failure->errorNumber == EBUSY)
+            throw SurfaceInUse(describe(*failure));
+        throw std::runtime_error(describe(*failure).append(adviceFor(*failure)));
     }
     schedule();
 }

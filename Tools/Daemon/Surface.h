@@ -12,6 +12,7 @@
 #include <functional>
 #include <memory>
 #include <optional>
+#include <stdexcept>
 #include <string>
 
 namespace ZorvaTouch::Tools {
@@ -43,6 +44,12 @@ struct SurfaceSurroundings {
     }
 };
 
+/// A surface cannot be opened since another program uses it; `what()` is the reason in one line.
+class SurfaceInUse : public std::runtime_error {
+public:
+    using std::runtime_error::runtime_error;
+};
+
 /// A surface that works: its device, the plug-in's service on it, and what its gestures do to the keyboard.
 ///
 /// However it ends, on its own account or because it is destroyed, its keys go up: at once when the device is
@@ -59,6 +66,7 @@ public:
     /// @param onLost  Called on the main thread, once at most, when the surface no longer works, with the
     /// reason; not
     ///                from within this object's functions.
+    /// @throws SurfaceInUse
     /// @throws std::runtime_error  It cannot be opened, with the reason in one line.
     /// @throws std::bad_alloc
     Surface(SurfaceSurroundings &surroundings, const SurfaceName &name, const DeviceMaker &maker,

@@ -59,11 +59,13 @@ void Surfaces::onChanged(const Linux::DeviceIdentity &device) {
 }
 
 void Surfaces::open(Entry &entry) {
+    entry.isInUse = false;
     try {
         entry.surface = std::make_unique<Surface>(
             _surroundings, entry.name, entry.maker,
             [this, &entry](const std::string &reason) { handleLoss(entry, reason); });
     } catch (const std::runtime_error &error) {
+        entry.isInUse = dynamic_cast<const SurfaceInUse *>(&error) != nullptr;
         _surroundings.listener.onSurface(entry.name, SurfaceState::Failed, error.what());
         retryLater(entry);
         return;
@@ -148,6 +150,11 @@ void Surfaces::forEach(const std::function<void(const SurfaceName &, const Surfa
     for (const Entry &entry : _entries)
         if (entry.surface)
             visit(entry.name, *entry.surface);
+}
+
+const SurfaceName *Surfaces::inUse() const noexcept {
+    const auto found = std::ranges::find_if(_entries, &Entry::isInUse);
+    return found == _entries.end() ? nullptr : &found->name;
 }
 
 // --- Names -------------------------------------------------------------------------------------------------

@@ -59,6 +59,8 @@ public:
     void forEach(const std::function<void(const SurfaceName &, const Surface &)> &visit) const;
     /// That are there, whether they work or not.
     [[nodiscard]] std::size_t count() const noexcept { return _entries.size(); }
+    /// The first that another program uses; null: there is none.
+    [[nodiscard]] const SurfaceName *inUse() const noexcept;
 
 private:
     struct Entry {
@@ -70,6 +72,7 @@ private:
         std::chrono::milliseconds nextRetry = kFirstRetry;
         Linux::LoopWatch retry = {};
         bool wantsReschedule = false;
+        bool isInUse = false; ///< by another program, at the last attempt to open it
     };
 
     void add(Entry entry);

@@ -27,6 +27,7 @@ public:
     [[nodiscard]] int descriptor() const noexcept override { return _near.get(); }
     [[nodiscard]] IoResult read(std::span<std::uint8_t> buffer) noexcept override;
     [[nodiscard]] IoResult deviceNumber(std::uint64_t &stored) noexcept override;
+    [[nodiscard]] IoResult lock() noexcept override { return {.errorNumber = lockError}; }
     [[nodiscard]] IoResult info(HidrawInfo &stored) noexcept override;
     [[nodiscard]] IoResult text(HidrawText which, std::span<std::uint8_t> buffer) noexcept override;
     [[nodiscard]] IoResult reportDescriptor(std::span<std::uint8_t> buffer) noexcept override;
@@ -37,7 +38,7 @@ public:
     unsigned reads = 0;
 
     std::uint64_t number = 0xF300; ///< the node's
-    int numberError = 0;
+    int numberError = 0, lockError = 0;
     int infoError = 0, textError = 0, descriptorError = 0;
     HidrawInfo hidrawInfo{.bus = 3, .vendor = 0x1234, .product = 0xABCD};
     Bytes name{'T', 'o', 'u', 'c', 'h', 0}, uniqueId{'S', 'N', '1', 0},

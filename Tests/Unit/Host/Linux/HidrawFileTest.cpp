@@ -49,6 +49,17 @@ TEST(HidrawFile, HasADeviceNumberIfItIsACharacterDevice) {
     EXPECT_EQ(HidrawFile::open("/etc/passwd").node->deviceNumber(number).errorNumber, ENOTTY);
 }
 
+TEST(HidrawFile, CanBeLockedOnceUntilItIsClosed) {
+    OpenedNode first = HidrawFile::open("/dev/null");
+    const OpenedNode second = HidrawFile::open("/dev/null");
+    EXPECT_EQ(first.node->lock().errorNumber, 0);
+    EXPECT_EQ(second.node->lock().errorNumber, EWOULDBLOCK);
+    std::array<std::uint8_t, 1> buffer{};
+    EXPECT_EQ(second.node->read(buffer).errorNumber, 0) << "reading goes on";
+    first.node.reset();
+    EXPECT_EQ(second.node->lock().errorNumber, 0);
+}
+
 TEST(HidrawFile, OfNoHidDeviceAnswersNothing) {
     const OpenedNode opened = HidrawFile::open("/dev/null");
     std::array<std::uint8_t, 64> buffer{4};

@@ -110,6 +110,29 @@ INSTANTIATE_TEST_SUITE_P(
         OtherNode{"no hidraw either", [](FakeNode &node) { node.infoError = EINVAL; }, kNoHidraw},
         OtherNode{"one that goes", [](FakeNode &node) { node.infoError = ENODEV; }, "open: No such device"}));
 
+// --- Locks -------------------------------------------------------------------------------------------------
+
+TEST_F(HidrawOpenOnly, LocksOnlyTheDeviceThatTheSystemDescribed) {
+    nodes.prepare = [](FakeNode &node) {
+        node.number = 0xF301;
+        node.lockError = EWOULDBLOCK;
+    };
+    const OpenedNode opened = openLocked(openOnly(identity(), nodes.opener()))();
+    EXPECT_EQ(describe({"open", opened.errorNumber, opened.detail}), kOther);
+}
+
+TEST(HidrawOpenLocked, RefusesANodeThatAnotherProgramHasLocked) {
+    FakeOpener nodes;
+    EXPECT_NE(openLocked(nodes.opener())().node, nullptr);
+    nodes.prepare = [](FakeNode &node) { node.lockError = EWOULDBLOCK; };
+    const OpenedNode busy = openLocked(nodes.opener())();
+    EXPECT_EQ(busy.node, nullptr);
+    EXPECT_EQ(busy.errorNumber, EBUSY);
+    EXPECT_STREQ(busy.detail, "in use by another program");
+    nodes.prepare = [](FakeNode &node) { node.lockError = ENOLCK; };
+    EXPECT_EQ(openLocked(nodes.opener())().errorNumber, ENOLCK);
+}
+
 // --- Nodes of the system -----------------------------------------------------------------------------------
 
 /// What the system has under a path, opened as the device with the unknown number.

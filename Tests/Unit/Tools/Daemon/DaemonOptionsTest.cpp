@@ -60,6 +60,7 @@ TEST(DaemonOptions, WithoutAnyItPressesKeysForWhatIsFound) {
     EXPECT_TRUE(options.sendsKeys);
     EXPECT_FALSE(options.showsEvents);
     EXPECT_FALSE(options.describe);
+    EXPECT_FALSE(options.waits);
     EXPECT_EQ(options.saveFile, std::nullopt);
     EXPECT_EQ(options.logLevel, Ports::LogLevel::Default);
     EXPECT_EQ(options.plugIn, std::nullopt);
@@ -137,6 +138,7 @@ TEST(DaemonOptions, TheRestIsUnderstoodInAnyOrder) {
 }
 
 TEST(DaemonOptions, ADescriptionMayBeOfChosenDevices) {
+    EXPECT_TRUE(optionsOf({"--wait"}).waits);
     EXPECT_TRUE(optionsOf({"--describe"}).describe);
     EXPECT_TRUE(optionsOf({"--describe", "--id", "1:2", "--accel", "none", "--log-level", "error"}).describe);
     EXPECT_TRUE(optionsOf({"--describe", "--device", "sim:day", "--seed", "3"}).describe);
@@ -157,8 +159,9 @@ TEST(DaemonOptions, HelpSaysWhatItIsAndNamesEveryOption) {
     const std::string help = answerTo({"--help"});
     EXPECT_THAT(help, StartsWith("Turns touches of the touch surface into media keys: "));
     EXPECT_THAT(help, HasSubstr("\nUsage: zorvatouchd [OPTIONS]\n"));
-    for (const char *option : {"--device", "--seed", "--duration", "--id", "--accel", "--map", "--no-keys",
-                               "--events", "--save", "--log-level", "--describe", "--plugin", "--version"})
+    for (const char *option :
+         {"--device", "--seed", "--duration", "--id", "--wait", "--accel", "--map", "--no-keys", "--events",
+          "--save", "--log-level", "--describe", "--plugin", "--version"})
         EXPECT_THAT(help, HasSubstr(std::string("\n  ") + option + " ")) << option;
     for (const char *group : {"Surfaces", "Keys", "Output", "Other", "Examples", "Signals", "Exit status"})
         EXPECT_THAT(help, HasSubstr(std::string("\n") + group + ":\n")) << group;
@@ -267,6 +270,7 @@ TEST(DaemonOptions, WhatDoesNotGoTogetherIsRefused) {
               "--id and --device exclude each other: --device looks for no make");
     EXPECT_EQ(problemWith({"--describe", "--save", "a"}), "--describe and --save exclude each other");
     EXPECT_EQ(problemWith({"--events", "json", "--describe"}), "--describe and --events exclude each other");
+    EXPECT_EQ(problemWith({"--describe", "--wait"}), "--describe and --wait exclude each other");
     EXPECT_EQ(problemWith({"--no-keys", "--describe"}), "--describe and --no-keys exclude each other");
     EXPECT_EQ(problemWith({"--describe", "--device", "sim:day", "--duration", "1"}),
               "--describe and --duration exclude each other");

@@ -510,6 +510,18 @@ TEST_F(SurfacesTest, AKeyStaysDownAsLongAsReportsCome) {
     EXPECT_THAT(keys.down(), SizeIs(1));
 }
 
+TEST_F(SurfacesTest, OneThatAnotherProgramUsesIsKnownUntilItWorks) {
+    surfaces->onAdded(identity(2, "SN2"));
+    EXPECT_EQ(surfaces->inUse(), nullptr);
+    opener(1).errors = {EBUSY};
+    surfaces->onAdded(identity(1, "SN1"));
+    ASSERT_NE(surfaces->inUse(), nullptr);
+    EXPECT_EQ(surfaces->inUse()->id, "SN1");
+    fireFirst();
+    EXPECT_EQ(surfaces->inUse(), nullptr);
+    EXPECT_THAT(told.surfaces.lines().back(), "opened SN1");
+}
+
 TEST_F(SurfacesTest, OneThatChangesIsTriedAgainAtOnce) {
     opener(1).errors = {EACCES};
     surfaces->onAdded(identity(1, "SN1"));
