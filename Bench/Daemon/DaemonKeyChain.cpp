@@ -115,7 +115,7 @@ public:
     DaemonChain(const Link &link, bool realTime)
         : _platform(realTime), _queue("bench-keys", realTime ? kPriority : 0),
           _keyboard([this] { return std::make_unique<KeyEndOutput>(_end); }, _end, log()),
-          _surroundings{.plugIn = ZORVA_BENCH_PLUGIN,
+          _surroundings{.plugIn = openPlugIn(ZORVA_BENCH_PLUGIN),
                         .events = nullptr,
                         .keyQueue = _queue,
                         .keyboard = _keyboard,

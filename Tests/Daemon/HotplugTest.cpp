@@ -5,6 +5,8 @@
 #include <umockdev.h>
 
 #include <cerrno>
+#include <filesystem>
+#include <fstream>
 #include <memory>
 #include <string>
 #include <vector>
@@ -146,6 +148,24 @@ TEST_F(DaemonHotplug, OneThatComesLaterAndIsUsedIsTriedAgain) {
         waitForState("opened", 1);
     });
     EXPECT_THAT(surfaces(), ElementsAre("added SN1", "failed SN1", "opened SN1"));
+}
+
+TEST_F(DaemonHotplug, KeepsThePlugInWhenItsFileIsReplaced) {
+    const Tests::TemporaryFolder folder;
+    const std::string replaced = folder.path("plugin.so");
+    std::filesystem::copy_file(plugIn, replaced);
+    plugIn = replaced;
+    start();
+    std::filesystem::remove(replaced); // as an upgrade does: the old file stays as it is
+    std::ofstream(replaced) << "no plug-in";
+    runWhile([this] {
+        TouchScript touch;
+        plug("1", "SN1");
+        waitForState("opened", 1);
+        send("1", touch.tapPlay());
+        output->lines.waitFor("\"type\":\"key\"", 2);
+    });
+    EXPECT_THAT(surfaces(), ElementsAre("added SN1", "opened SN1"));
 }
 
 TEST_F(DaemonHotplug, WaitsForTheDriverAndThenOpens) {

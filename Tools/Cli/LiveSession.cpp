@@ -30,7 +30,7 @@ LiveSession::LiveSession(const LiveOptions &options, EventInbox &inbox, Environm
       _offered(Host::Service::create(_device, _events)), _queue(kQueueThreadName) {
     for (const char *const key : kIdentityKeys)
         _device->properties().makeReadOnly(key);
-    _service.emplace(options.plugIn);
+    _service.emplace(openPlugIn(options.plugIn));
 }
 
 LiveSession::~LiveSession() {

@@ -2,6 +2,7 @@
 
 #include "Host/Linux/RealTime.h"
 #include "Host/Linux/StartUpCode.h"
+#include "Host/Linux/TrustedFile.h"
 #include "Shared/LogNames.h"
 #include "Shared/Util/Ticks.h"
 #include "Tools/Daemon/DaemonChoices.h"
@@ -38,6 +39,7 @@ std::string droppedLine(bool isJson, std::uint64_t lines) {
 Daemon::Daemon(const DaemonOptions &options, DaemonSurroundings surroundings)
     : _options(options), _surroundings(std::move(surroundings)), _logs(makeLogs()),
       _platform(std::make_unique<PlugInLogs>(_logs), &_surroundings.clock), _log(*_logs, "Daemon"),
+      _plugIn(loadPlugIn()),
       _stream(
           _surroundings.output,
           [isJson = options.showsEvents](std::uint64_t lines) { return droppedLine(isJson, lines); },
@@ -47,7 +49,7 @@ Daemon::Daemon(const DaemonOptions &options, DaemonSurroundings surroundings)
       _events(Host::EventSystem::create()),
       _recordings(options.saveFile, *_listener, DaemonLog(*_logs, "Recordings")),
       _signals(kSignals, [this](int signal) { handleSignal(signal); }),
-      _surfaces({.plugIn = _surroundings.plugIn,
+      _surfaces({.plugIn = _plugIn,
                  .events = _events,
                  .keyQueue = _keyQueue,
                  .keyboard = _keyboard,
@@ -63,7 +65,6 @@ Daemon::Daemon(const DaemonOptions &options, DaemonSurroundings surroundings)
     requireNodes(deviceFilterOf(_options));
     if (_options.saveFile)
         requireSavable(*_options.saveFile); // rather now than when it is too late
-    checkPlugIn();
     watchAccelerometers();
     startSimulations();
     watchDevices();
@@ -103,10 +104,12 @@ int Daemon::realTimePriority() {
     return kKeyThreadPriority;
 }
 
-/// Rather now than with the first surface.
-void Daemon::checkPlugIn() {
-    const HostedService service(_surroundings.plugIn);
-    _log.notice({_surroundings.plugIn, ", version ", service.version()});
+/// Before the first surface: what is wrong with it ends the daemon at the start.
+std::shared_ptr<const Host::PlugInFile> Daemon::loadPlugIn() const {
+    auto plugIn = openPlugIn(Linux::trustedPath(_surroundings.plugIn));
+    const HostedService service(plugIn);
+    _log.notice({plugIn->path(), ", version ", service.version()});
+    return plugIn;
 }
 
 // --- What it hears -----------------------------------------------------------------------------------------

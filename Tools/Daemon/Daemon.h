@@ -68,7 +68,7 @@ public:
     void run();
 
 private:
-    void checkPlugIn();
+    [[nodiscard]] std::shared_ptr<const Host::PlugInFile> loadPlugIn() const;
     [[nodiscard]] std::unique_ptr<DaemonListener> makeListener();
     [[nodiscard]] std::shared_ptr<Linux::RateLimitedLogs> makeLogs();
     /// Of the key thread, 0 if none is allowed.
@@ -98,6 +98,8 @@ private:
     const std::shared_ptr<Linux::RateLimitedLogs> _logs;
     SessionPlatform _platform;
     const DaemonLog _log;
+    const std::shared_ptr<const Host::PlugInFile>
+        _plugIn; ///< the same for every surface, as long as it lives
     EventStream _stream;
     const std::unique_ptr<DaemonListener> _listener;
     Host::SerialQueue _keyQueue;

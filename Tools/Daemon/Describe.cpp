@@ -3,6 +3,7 @@
 #include "Host/Linux/AccelMonitor.h"
 #include "Host/Linux/DeviceMonitor.h"
 #include "Host/Linux/RealTime.h"
+#include "Host/Linux/TrustedFile.h"
 #include "Host/Linux/VirtualKeyboard.h"
 #include "Host/Objects/Service.h"
 #include "Shared/Util/Json.h"
@@ -17,6 +18,8 @@
 
 namespace ZorvaTouch::Tools {
 namespace {
+
+using PlugIn = std::shared_ptr<const Host::PlugInFile>;
 
 constexpr int kRealTimePriority = 63;
 constexpr const char *kAllowed = "allowed";
@@ -58,7 +61,7 @@ void copyProperties(const HostedService &service, const std::array<const char *,
 }
 
 /// Opens the device, asks it, and closes it again.
-void askDevice(const Linux::DeviceIdentity &device, const std::string &plugIn, const DeviceFinder &finder,
+void askDevice(const Linux::DeviceIdentity &device, const PlugIn &plugIn, const DeviceFinder &finder,
                PropertyValue::Dictionary &described) {
     try {
         HostedService service(plugIn);
@@ -71,15 +74,15 @@ void askDevice(const Linux::DeviceIdentity &device, const std::string &plugIn, c
     }
 }
 
-PropertyValue describeSurface(const Linux::DeviceIdentity &device, const std::string &plugIn,
+PropertyValue describeSurface(const Linux::DeviceIdentity &device, const PlugIn &plugIn,
                               const DeviceFinder &finder) {
     PropertyValue::Dictionary described{{"Node", device.devnode}, {"Identity", device.stableId()}};
     askDevice(device, plugIn, finder, described);
     return described;
 }
 
-PropertyValue describeSurfaces(const DaemonOptions &options, const std::string &plugIn,
-                               const DeviceFinder &finder, const std::function<void(std::string_view)> &say) {
+PropertyValue describeSurfaces(const DaemonOptions &options, const PlugIn &plugIn, const DeviceFinder &finder,
+                               const std::function<void(std::string_view)> &say) {
     Found<Linux::DeviceListener, Linux::DeviceIdentity> found;
     const Linux::DeviceFilter filter = deviceFilterOf(options);
     requireNodes(filter);
@@ -92,8 +95,8 @@ PropertyValue describeSurfaces(const DaemonOptions &options, const std::string &
     return all;
 }
 
-PropertyValue describePlugIn(const std::string &file) {
-    return PropertyValue::Dictionary{{"File", file}, {"Version", HostedService(file).version()}};
+PropertyValue describePlugIn(const PlugIn &plugIn) {
+    return PropertyValue::Dictionary{{"File", plugIn->path()}, {"Version", HostedService(plugIn).version()}};
 }
 
 PropertyValue allowedOr(const std::optional<Linux::RealTimeRefusal> &refusal) {
@@ -102,8 +105,9 @@ PropertyValue allowedOr(const std::optional<Linux::RealTimeRefusal> &refusal) {
 
 } // namespace
 
-std::string describeSystem(const DaemonOptions &options, const std::string &plugIn,
-                           const DeviceFinder &finder, const std::function<void(std::string_view)> &say) {
+std::string describeSystem(const DaemonOptions &options, const std::string &file, const DeviceFinder &finder,
+                           const std::function<void(std::string_view)> &say) {
+    const PlugIn plugIn = openPlugIn(Linux::trustedPath(file));
     const bool hasUdev = Linux::detectMonitorSource() == Linux::MonitorSource::Udev;
     return indentedJson(Util::jsonText(PropertyValue::Dictionary{
         {"Program", ZORVA_VERSION},

@@ -15,12 +15,12 @@ namespace ZorvaTouch::Tools {
 /// What cannot be found out is told in the place of the answer. A device that does not answer keeps each of
 /// its eleven questions waiting for up to five seconds.
 ///
-/// @param plugIn  The file.
+/// @param file    The plug-in's.
 /// @param finder  Makes the devices that the system tells of.
 /// @param say     Told what takes long, one line each.
 /// @throws std::system_error  The system's devices cannot be listed.
-/// @throws HostingError       The plug-in cannot be loaded.
-[[nodiscard]] std::string describeSystem(const DaemonOptions &options, const std::string &plugIn,
+/// @throws std::runtime_error  The plug-in cannot be loaded.
+[[nodiscard]] std::string describeSystem(const DaemonOptions &options, const std::string &file,
                                          const DeviceFinder &finder,
                                          const std::function<void(std::string_view)> &say);
 

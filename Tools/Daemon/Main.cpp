@@ -18,6 +18,7 @@
 #include <memory>
 #include <string>
 #include <string_view>
+#include <utility>
 #include <variant>
 #include <vector>
 
@@ -81,9 +82,10 @@ int runDaemon(const Tools::DaemonOptions &options) {
          .output = std::make_shared<Host::StreamWriter>(Host::StandardStream::Output),
          .usesColour = Host::showsColours(Host::StandardStream::Output),
          .keyboard = [codes = options.keys.codes()] { return Linux::VirtualKeyboard::create(codes); },
-         .finder = [](const Linux::DeviceIdentity &device) {
-             return makerFor(Linux::openLocked(openerOf(device)));
-         }});
+         .finder =
+             [](const Linux::DeviceIdentity &device) {
+                 return makerFor(Linux::openLocked(openerOf(device)));
+             }});
     daemon.run();
     return kExitEnded;
 }
@@ -103,7 +105,9 @@ int describe(const Tools::DaemonOptions &options) {
         if (Host::isTerminal(Host::StandardStream::Error))
             complain(std::string(line));
     };
-    print(describeSystem(options, plugInOf(options), hidrawDevice, progress));
+    print(describeSystem(
+        options, plugInOf(options),
+        [](const Linux::DeviceIdentity &device) { return makerFor(openerOf(device)); }, progress));
     return kExitEnded;
 }
 

@@ -24,9 +24,9 @@ using DeviceMaker = std::function<Ref<ZorvaDevice>(std::shared_ptr<Linux::Hidraw
 using LoopTimer =
     std::function<Linux::LoopWatch(std::chrono::microseconds delay, std::function<void()> function)>;
 
-/// What all surfaces share. Borrowed but for the file's name and the event system.
+/// What all surfaces share. Borrowed but for the plug-in and the event system.
 struct SurfaceSurroundings {
-    std::string plugIn; ///< the file
+    std::shared_ptr<const Host::PlugInFile> plugIn;
     std::shared_ptr<Host::EventSystem> events;
     Host::SerialQueue &keyQueue;
     Keyboard &keyboard;

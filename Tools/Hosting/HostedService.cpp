@@ -14,14 +14,6 @@ namespace {
 
 constexpr std::uint32_t kNoOptions = 0;
 
-Host::PlugInFile openPlugIn(const std::string &file) {
-    try {
-        return Host::PlugInFile(file);
-    } catch (const std::runtime_error &error) {
-        throw HostingError(error.what());
-    }
-}
-
 std::string hexText(ZorvaStatus status) {
     std::array<char, 8> digits;
     const auto end = std::to_chars(digits.data(), digits.data() + digits.size(), status, 16).ptr;
@@ -43,10 +35,18 @@ std::string versionText(const PropertyValue &version) {
 
 } // namespace
 
-HostedService::HostedService(std::string file) : _file(std::move(file)), _plugIn(openPlugIn(_file)) {
+std::shared_ptr<const Host::PlugInFile> openPlugIn(const std::string &file) {
+    try {
+        return std::make_shared<const Host::PlugInFile>(file);
+    } catch (const Host::PlugInFailure &error) {
+        throw HostingError(error.what());
+    }
+}
+
+HostedService::HostedService(std::shared_ptr<const Host::PlugInFile> plugIn) : _plugIn(std::move(plugIn)) {
     ZorvaPlugInFactory factory = nullptr;
     try {
-        factory = _plugIn.factory(ZORVA_TOUCH_FACTORY_NAME);
+        factory = _plugIn->factory(ZORVA_TOUCH_FACTORY_NAME);
     } catch (const std::runtime_error &error) {
         throw HostingError(error.what());
     }
@@ -111,7 +111,7 @@ std::string HostedService::version() const {
     return version ? versionText(*version) : "?";
 }
 
-void HostedService::fail(const std::string &problem) const { throw HostingError(_file + ": " + problem); }
+void HostedService::fail(const std::string &problem) const { throw HostingError(file() + ": " + problem); }
 
 void HostedService::require(ZorvaStatus status, const char *operation) const {
     if (status != ZORVA_STATUS_SUCCESS)

@@ -4,6 +4,7 @@
 #include "Plugin/ZorvaPlugIn.h"
 #include "Shared/Util/PropertyValue.h"
 
+#include <memory>
 #include <optional>
 #include <stdexcept>
 #include <string>
@@ -17,15 +18,21 @@ public:
     using std::runtime_error::runtime_error;
 };
 
+/// Loads a plug-in's file. One that is loaded stays as it is for all services that are made from it, also
+/// when the file is replaced.
+/// @throws HostingError  The file cannot be loaded.
+[[nodiscard]] std::shared_ptr<const Host::PlugInFile> openPlugIn(const std::string &file);
+
 /// A HID service from a plug-in's file, driven as any host does: through the factory and the two tables
 /// alone. What was begun is undone in the end, in the opposite order.
 ///
 /// Threads: one; the service's own threads are its own affair.
 class HostedService {
 public:
-    /// Loads the file and makes a service.
-    /// @throws HostingError  The file cannot be loaded, or is no plug-in with such a service.
-    explicit HostedService(std::string file);
+    /// Makes a service.
+    /// @param plugIn  Kept as long as the service.
+    /// @throws HostingError  The file is no plug-in with such a service.
+    explicit HostedService(std::shared_ptr<const Host::PlugInFile> plugIn);
     ~HostedService();
     HostedService(const HostedService &) = delete;
     HostedService &operator=(const HostedService &) = delete;
@@ -45,7 +52,7 @@ public:
     /// @return Whether the service took it.
     [[nodiscard]] bool setProperty(const std::string &key, const PropertyValue &value);
 
-    [[nodiscard]] const std::string &file() const noexcept { return _file; }
+    [[nodiscard]] const std::string &file() const noexcept { return _plugIn->path(); }
     /// The property "Version" as it is written, "26.0.0"; "?" if there is none.
     [[nodiscard]] std::string version() const;
 
@@ -53,8 +60,7 @@ private:
     [[noreturn]] void fail(const std::string &problem) const;
     void require(ZorvaStatus status, const char *operation) const;
 
-    const std::string _file;
-    Host::PlugInFile _plugIn;
+    const std::shared_ptr<const Host::PlugInFile> _plugIn;
     PlugInInterfaceTable **_plug = nullptr;    ///< one reference
     HidServiceInterfaceTable **_hid = nullptr; ///< one reference
     ZorvaQueue *_queue = nullptr;              ///< while scheduled

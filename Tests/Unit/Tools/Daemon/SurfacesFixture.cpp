@@ -102,7 +102,7 @@ std::vector<Bytes> TouchScript::tapPlay() {
 SurfacesFixture::SurfacesFixture() {
     keyQueue.drain(); // its thread runs, for whose start a sanitizer opens a descriptor
     surfaces.emplace(
-        SurfaceSurroundings{.plugIn = ZORVA_TEST_PLUGIN,
+        SurfaceSurroundings{.plugIn = openPlugIn(ZORVA_TEST_PLUGIN),
                             .events = events,
                             .keyQueue = keyQueue,
                             .keyboard = keyboard,
