@@ -15,6 +15,7 @@ double nowNs(clockid_t clock) {
 } // namespace
 
 double threadCpuNs() { return nowNs(CLOCK_THREAD_CPUTIME_ID); }
+double processCpuNs() { return nowNs(CLOCK_PROCESS_CPUTIME_ID); }
 double wallNs() { return nowNs(CLOCK_MONOTONIC); }
 
 double Samples::median() const {

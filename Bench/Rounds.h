@@ -11,6 +11,8 @@ namespace ZorvaTouch::Bench {
 
 /// Processor time of the calling thread in ns: what other programs take does not count.
 [[nodiscard]] double threadCpuNs();
+/// Processor time of all threads of this process in ns.
+[[nodiscard]] double processCpuNs();
 /// A clock on the wall in ns, for what is too short for the other one and for whole processes.
 [[nodiscard]] double wallNs();
 

@@ -16,4 +16,7 @@ void measureIdleReports(BarTable &bars, bool isShort);
 /// Memory and wake-ups of the daemon without a surface, beside a program that links the same libraries.
 void measureIdleDaemon(BarTable &bars, bool isShort);
 
+/// Processor time of the daemon with 16 simulated surfaces that are touched, beside one.
+void measureManySurfaces(BarTable &bars, bool isShort);
+
 } // namespace ZorvaTouch::Bench

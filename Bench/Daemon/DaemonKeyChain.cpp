@@ -104,12 +104,6 @@ private:
     KeyEnd &_end;
 };
 
-double processCpuNs() {
-    timespec time{};
-    ::clock_gettime(CLOCK_PROCESS_CPUTIME_ID, &time);
-    return static_cast<double>(time.tv_sec) * 1e9 + static_cast<double>(time.tv_nsec);
-}
-
 class DaemonChain final : public KeyChain {
 public:
     DaemonChain(const Link &link, bool realTime)
@@ -131,7 +125,7 @@ public:
                       observer);
                   return _device;
               },
-              [](const std::string &) {}) {}
+              nullptr, [](const std::string &) {}) {}
 
     void watch(KeyJourney *journey) override { _end.journey = journey; }
     void advanceTo(std::size_t report) override {

@@ -1,6 +1,7 @@
 #include "Tests/Daemon/DaemonFixture.h"
 
 #include "Host/Runtime/Files.h"
+#include "Service/AccelCapture.h"
 #include "Shared/RecordingContainer.h"
 
 #include <gmock/gmock.h>
@@ -71,6 +72,21 @@ TEST_F(DaemonTest, TwoFingersOfOneKindAreTwoSurfacesAndItEndsWithTheLast) {
     EXPECT_THAT(linesWith("\"opened\""), SizeIs(2));
     EXPECT_THAT(linesWith("\"surface\":\"sim:taps-2\""), SizeIs(2));
     EXPECT_THAT(linesWith("\"key\":"), SizeIs(2));
+}
+
+TEST_F(DaemonTest, EachFingerShakesTheAccelerometerOfItsOwnSurfaceAlone) {
+    const Tests::TemporaryFolder folder;
+    options.saveFile = folder.path("touch.json");
+    for (int i = 0; i < 3; ++i)
+        addFinger("taps", 0.95); // 95 samples at 100 Hz, and a gesture, without which none is recorded
+    runToTheEnd();
+    for (const char *const name : {"touch.json", "touch-2.json", "touch-3.json"}) {
+        std::size_t samples = 0;
+        for (const FrameView frame : readRecordingContainer(Host::readFile(folder.path(name))).frames)
+            samples += frame.key == kAccelMetadataKey ? 1U : 0U;
+        EXPECT_GT(samples, 0u) << name;
+        EXPECT_LE(samples, 95u) << name;
+    }
 }
 
 TEST_F(DaemonTest, WithoutAKeyboardKeysAreTold) {

@@ -233,19 +233,16 @@ void Daemon::flushLogsWhenDue() {
 // --- Simulations -------------------------------------------------------------------------------------------
 
 void Daemon::startSimulations() {
+    // A finger shakes the machine, too, unless there is a real accelerometer.
+    const bool hasAccelerometer = _accelHub && !_accelerometer;
     for (const DeviceOption &device : _options.devices)
         if (const auto *const finger = std::get_if<SimulatedFinger>(&device)) {
-            SimulatedSurface &simulation = _simulations.emplace_back(*finger, simulatedAccelerometer(), _loop,
-                                                                     [this] { finishSimulation(); });
-            _surfaces.add(simulation.name(), simulation.maker());
+            SimulatedSurface &simulation =
+                _simulations.emplace_back(*finger, hasAccelerometer, _loop, [this] { finishSimulation(); });
+            _surfaces.add(simulation.name(), simulation.maker(), simulation.events());
             simulation.play();
             ++_playing;
         }
-}
-
-/// The finger shakes the machine, too, unless there is a real one to be shaken.
-Ref<Host::Accelerometer> Daemon::simulatedAccelerometer() {
-    return _accelHub && !_accelerometer ? Host::Accelerometer::create(_events) : Ref<Host::Accelerometer>();
 }
 
 /// When all have been played and nothing else is there to wait for, that was it.

@@ -83,7 +83,6 @@ private:
     void logMissingDevices(const Linux::DeviceFilter &filter);
     void watchSleep();
 
-    [[nodiscard]] Ref<Host::Accelerometer> simulatedAccelerometer();
     void withAccelMonitor(const std::function<void()> &use);
     void noteAccelerometer();
     void flushLogsWhenDue();

@@ -7,14 +7,17 @@
 
 namespace ZorvaTouch::Tools {
 
-SimulatedSurface::SimulatedSurface(const SimulatedFinger &finger, Ref<Host::Accelerometer> accelerometer,
+SimulatedSurface::SimulatedSurface(const SimulatedFinger &finger, bool hasAccelerometer,
                                    Linux::MainLoop &loop, std::function<void()> onFinished)
-    : _finger(finger), _loop(loop), _onFinished(std::move(onFinished)), _device(Simulated::Device::create()),
-      _isThere(std::make_shared<bool>(true)), _player(frames(), {.device = _device,
-                                                                 .accelerometer = std::move(accelerometer),
-                                                                 .onReport = nullptr,
-                                                                 .onMetadata = nullptr,
-                                                                 .onState = nullptr}) {}
+    : _finger(finger), _loop(loop), _onFinished(std::move(onFinished)),
+      _events(hasAccelerometer ? Host::EventSystem::create() : nullptr), _device(Simulated::Device::create()),
+      _isThere(std::make_shared<bool>(true)),
+      _player(frames(),
+              {.device = _device,
+               .accelerometer = _events ? Host::Accelerometer::create(_events) : Ref<Host::Accelerometer>(),
+               .onReport = nullptr,
+               .onMetadata = nullptr,
+               .onState = nullptr}) {}
 
 SimulatedSurface::~SimulatedSurface() { *_isThere = false; }
 

@@ -20,12 +20,13 @@ std::string_view adviceFor(const Linux::SystemFailure &failure) noexcept {
 } // namespace
 
 Surface::Surface(SurfaceSurroundings &surroundings, const SurfaceName &name, const DeviceMaker &maker,
+                 const std::shared_ptr<Host::EventSystem> &events,
                  std::function<void(const std::string &)> onLost)
     : _surroundings(surroundings), _name(name),
       _observer(std::make_shared<Observer>(surroundings, std::move(onLost), [this] { watchSilence(); })),
       _service(surroundings.plugIn) {
     try {
-        _service->start(Host::Service::create(maker(_observer), surroundings.events).get());
+        _service->start(Host::Service::create(maker(_observer), events).get());
     } catch (const HostingError &) {
         const auto failure = _observer->openFailure();
         if (!failure)

@@ -27,7 +27,7 @@ using LoopTimer =
 /// What all surfaces share. Borrowed but for the plug-in and the event system.
 struct SurfaceSurroundings {
     std::shared_ptr<const Host::PlugInFile> plugIn;
-    std::shared_ptr<Host::EventSystem> events;
+    std::shared_ptr<Host::EventSystem> events; ///< of surfaces without an accelerometer of their own
     Host::SerialQueue &keyQueue;
     Keyboard &keyboard;
     KeyMap keyMap;
@@ -63,13 +63,14 @@ public:
     static constexpr std::chrono::milliseconds kLongestSilence{900};
 
     /// Opens the device and begins to listen.
+    /// @param events  Where its accelerometer is.
     /// @param onLost  Called on the main thread, once at most, when the surface no longer works, with the
-    /// reason; not
-    ///                from within this object's functions.
+    ///                reason; not from within this object's functions.
     /// @throws SurfaceInUse
     /// @throws std::runtime_error  It cannot be opened, with the reason in one line.
     /// @throws std::bad_alloc
     Surface(SurfaceSurroundings &surroundings, const SurfaceName &name, const DeviceMaker &maker,
+            const std::shared_ptr<Host::EventSystem> &events,
             std::function<void(const std::string &reason)> onLost);
     /// Closes the device, with everything that came before carried out and every key up.
     ~Surface();

@@ -24,13 +24,19 @@ Surfaces::~Surfaces() { closeAll(); }
 // --- Coming and going --------------------------------------------------------------------------------------
 
 void Surfaces::onAdded(const Linux::DeviceIdentity &device) {
-    add({.name = nameOf(device), .syspath = device.syspath, .maker = _finder(device)});
+    add({.name = nameOf(device),
+         .syspath = device.syspath,
+         .maker = _finder(device),
+         .events = _surroundings.events});
 }
 
-void Surfaces::add(const SurfaceName &name, DeviceMaker maker) {
+void Surfaces::add(const SurfaceName &name, DeviceMaker maker, std::shared_ptr<Host::EventSystem> events) {
     SurfaceName own = name;
     makeUnique(own.id);
-    add({.name = std::move(own), .syspath = {}, .maker = std::move(maker)});
+    add({.name = std::move(own),
+         .syspath = {},
+         .maker = std::move(maker),
+         .events = events ? std::move(events) : _surroundings.events});
 }
 
 void Surfaces::add(Entry entry) {
@@ -62,7 +68,7 @@ void Surfaces::open(Entry &entry) {
     entry.isInUse = false;
     try {
         entry.surface = std::make_unique<Surface>(
-            _surroundings, entry.name, entry.maker,
+            _surroundings, entry.name, entry.maker, entry.events,
             [this, &entry](const std::string &reason) { handleLoss(entry, reason); });
     } catch (const std::runtime_error &error) {
         entry.isInUse = dynamic_cast<const SurfaceInUse *>(&error) != nullptr;

@@ -46,7 +46,8 @@ public:
     void onChanged(const Linux::DeviceIdentity &device) override;
 
     /// A surface that the system does not tell of.
-    void add(const SurfaceName &name, DeviceMaker maker);
+    /// @param events  Where its accelerometer is; null: that of all surfaces.
+    void add(const SurfaceName &name, DeviceMaker maker, std::shared_ptr<Host::EventSystem> events = nullptr);
 
     /// Has every surface listen anew as soon as nothing is touched there.
     void reschedule();
@@ -67,6 +68,7 @@ private:
         SurfaceName name;
         std::string syspath; ///< empty for those that the system does not tell of
         DeviceMaker maker;
+        std::shared_ptr<Host::EventSystem> events;
         std::unique_ptr<Surface> surface = {}; ///< null while it does not work
         std::uint64_t openedNs = 0;
         std::chrono::milliseconds nextRetry = kFirstRetry;

@@ -30,14 +30,14 @@ protected:
 };
 
 TEST_F(SimulatedSurfaceTest, IsCalledByItsScenarioAndHasOneDevice) {
-    const SimulatedSurface surface(finger("taps", 0.1), {}, loop, [] {});
+    const SimulatedSurface surface(finger("taps", 0.1), false, loop, [] {});
     EXPECT_EQ(surface.name().id, "sim:taps");
     EXPECT_EQ(surface.name().node, "sim:taps");
     EXPECT_EQ(surface.maker()(nullptr).get(), surface.maker()(nullptr).get());
 }
 
 TEST_F(SimulatedSurfaceTest, SaysOnTheMainLoopWhenAllHasBeenPlayed) {
-    SimulatedSurface surface(finger("taps", 0.1), {}, loop, [this] {
+    SimulatedSurface surface(finger("taps", 0.1), false, loop, [this] {
         ++finished;
         loop.quit();
     });
@@ -48,12 +48,20 @@ TEST_F(SimulatedSurfaceTest, SaysOnTheMainLoopWhenAllHasBeenPlayed) {
 
 TEST_F(SimulatedSurfaceTest, OneThatIsGoneSaysNothing) {
     {
-        SimulatedSurface surface(finger("idle", 36000), {}, loop, [this] { ++finished; });
+        SimulatedSurface surface(finger("idle", 36000), false, loop, [this] { ++finished; });
         surface.play();
     }
     loop.post([this] { loop.quit(); });
     loop.run();
     EXPECT_EQ(finished, 0);
+}
+
+TEST_F(SimulatedSurfaceTest, HasAnEventSystemOfItsOwnForItsAccelerometer) {
+    const SimulatedSurface first(finger("taps", 0.1), true, loop, [] {});
+    const SimulatedSurface second(finger("taps", 0.1), true, loop, [] {});
+    EXPECT_NE(first.events(), nullptr);
+    EXPECT_NE(first.events(), second.events());
+    EXPECT_EQ(SimulatedSurface(finger("taps", 0.1), false, loop, [] {}).events(), nullptr);
 }
 
 /// A simulated device among the surfaces, in lock-step with a clock that stands still in between.

@@ -511,6 +511,30 @@ TEST_F(SurfacesTest, AKeyStaysDownAsLongAsReportsCome) {
     EXPECT_THAT(keys.down(), SizeIs(1));
 }
 
+TEST_F(SurfacesTest, OneWithAnAccelerometerOfItsOwnGetsNoSamplesOfOthers) {
+    std::vector<std::shared_ptr<Host::EventSystem>> systems;
+    std::vector<Ref<Host::Accelerometer>> accelerometers;
+    std::vector<Ref<Simulated::Device>> devices;
+    for (int i = 0; i < 2; ++i) {
+        systems.push_back(Host::EventSystem::create());
+        accelerometers.push_back(Host::Accelerometer::create(systems.back()));
+        devices.push_back(Simulated::Device::create());
+        surfaces->add(
+            {.id = "sim", .node = "sim", .name = ""},
+            [device = devices.back()](const std::shared_ptr<Linux::HidrawObserver> &) { return device; },
+            systems.back());
+        platform.waitUntilServing();
+    }
+    for (int i = 0; i < 3; ++i) {
+        accelerometers[0]->deliver(0, 0, 1, 1000);
+        accelerometers[0]->waitUntilHandled();
+    }
+    EXPECT_EQ(systems[0]->counters().heard, 3u);
+    EXPECT_EQ(systems[1]->counters().clients, 1u);
+    EXPECT_EQ(systems[1]->counters().heard, 0u);
+    EXPECT_EQ(events->counters().clients, 0u);
+}
+
 TEST_F(SurfacesTest, OneThatAnotherProgramUsesIsKnownUntilItWorks) {
     surfaces->onAdded(identity(2, "SN2"));
     EXPECT_EQ(surfaces->inUse(), nullptr);
