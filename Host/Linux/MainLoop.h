@@ -27,6 +27,9 @@ private:
     std::unique_ptr<Source> _source;
 };
 
+/// Has something called later, as `MainLoop::after` does; tests have timers of their own.
+using LoopTimer = std::function<LoopWatch(std::chrono::microseconds delay, std::function<void()> function)>;
+
 /// The loop of a program's main thread, on sd-event: it sleeps until a descriptor is readable, a time has
 /// come or another thread has something to be run. What a function throws ends `run` with it.
 ///

@@ -1,12 +1,13 @@
 #include "Host/Linux/SleepWatch.h"
 
-#include "Host/Linux/MainLoop.h"
+#include "Host/Linux/BackOff.h"
 #include "Host/Linux/UniqueFd.h"
 #include "Shared/LogNames.h"
 
 #include <fcntl.h>
 #include <systemd/sd-bus.h>
 
+#include <chrono>
 #include <cstddef>
 #include <cstdint>
 #include <exception>
@@ -75,14 +76,20 @@ std::string describeError(sd_bus_message *reply) {
 /// The conversation with the bus and with logind.
 class SleepWatch::Logind {
 public:
-    Logind(MainLoop &loop, std::shared_ptr<Ports::Log> log, Function onSleep, Function onWake)
-        : _loop(loop), _log(std::move(log)), _onSleep(std::move(onSleep)), _onWake(std::move(onWake)) {}
+    Logind(MainLoop &loop, std::shared_ptr<Ports::Log> log, Function onSleep, Function onWake,
+           LoopTimer after)
+        : _loop(loop), _log(std::move(log)), _onSleep(std::move(onSleep)), _onWake(std::move(onWake)),
+          _after(after ? std::move(after) : loopTimer(loop)) {}
 
     void connect() {
-        if (const int error = attach()) {
-            _bus.reset();
-            tell("no system bus: " + std::generic_category().message(error));
-        }
+        _pending.reset();
+        _bus.reset();
+        const int error = attach();
+        if (error == 0)
+            return;
+        _bus.reset();
+        tell("no system bus: " + std::generic_category().message(error));
+        connectLater();
     }
 
     [[nodiscard]] bool isHoldingSleep() const noexcept { return static_cast<bool>(_inhibitor); }
@@ -100,6 +107,16 @@ private:
             self._loop.post([failure = std::current_exception()] { std::rethrow_exception(failure); });
         }
         return 0;
+    }
+
+    static LoopTimer loopTimer(MainLoop &loop) {
+        return [&loop](std::chrono::microseconds delay, Function function) {
+            return loop.after(delay, std::move(function));
+        };
+    }
+
+    void connectLater() {
+        _retry = _after(_backOff.next(), [this] { connect(); });
     }
 
     /// @return An errno, or 0.
@@ -132,6 +149,8 @@ private:
     // --- Who logind is -------------------------------------------------------------------------------------
 
     void ownerFound(sd_bus_message *reply) {
+        if (isConnected()) // a bus that answers; one that only accepts is no reason to hurry
+            _backOff.reset();
         const char *owner = "";
         if (!::sd_bus_message_is_method_error(reply, nullptr) &&
             ::sd_bus_message_read(reply, "s", &owner) > 0)
@@ -167,6 +186,7 @@ private:
         tell("the system bus is gone");
         logindIs("");
         _inhibitor.reset();
+        connectLater();
     }
 
     // --- The sleep -----------------------------------------------------------------------------------------
@@ -244,6 +264,9 @@ private:
     MainLoop &_loop;
     const std::shared_ptr<Ports::Log> _log;
     const Function _onSleep, _onWake;
+    const LoopTimer _after;
+    BackOff _backOff;
+    LoopWatch _retry;    ///< while there is no bus
     std::string _owner;  ///< logind's name on the bus; empty: it is not there
     UniqueFd _inhibitor; ///< logind waits as long as it is open
     bool _isAsleep = false;
@@ -252,9 +275,10 @@ private:
     Owned<sd_bus_slot> _pending; ///< a call of Inhibit
 };
 
-SleepWatch::SleepWatch(MainLoop &loop, Ports::LogProvider &logs, Function onSleep, Function onWake)
+SleepWatch::SleepWatch(MainLoop &loop, Ports::LogProvider &logs, Function onSleep, Function onWake,
+                       LoopTimer after)
     : _logind(std::make_unique<Logind>(loop, logs.openLog(kLogSubsystem, "Sleep"), std::move(onSleep),
-                                       std::move(onWake))) {
+                                       std::move(onWake), std::move(after))) {
     _logind->connect();
 }
 

@@ -6,4 +6,5 @@ source "$(dirname -- "${BASH_SOURCE[0]}")/lib/guest.sh"
 
 load hid
 start_udev
+start_bus    # a daemon without one connects again and again
 exec /usr/bin/python3 "${tests:?}/daemon-idle.py"

@@ -3,15 +3,20 @@
 
 #include <unistd.h>
 
+#include <chrono>
 #include <exception>
+#include <functional>
 #include <iostream>
 #include <memory>
+#include <optional>
 #include <string>
 #include <string_view>
+#include <utility>
 
 // Tells on standard output what a SleepWatch tells, a line for each:
 //
 //     ready      it is there
+//     retry in N ms  it waits so long before it connects to the bus again: until a line "retry" of input
 //     sleep      onSleep was called; it returns after a line of input
 //     wake       onWake was called
 //     log: TEXT  a record of its log
@@ -41,14 +46,35 @@ private:
 };
 
 /// Reads a line of standard input, and no more than that.
-/// @return Whether there was one.
-bool readLine() {
-    char character = 0;
-    while (::read(STDIN_FILENO, &character, 1) == 1)
+/// @return Nothing if there was none.
+std::optional<std::string> readLine() {
+    std::string line;
+    for (char character = 0; ::read(STDIN_FILENO, &character, 1) == 1; line += character)
         if (character == '\n')
-            return true;
-    return false;
+            return line;
+    return std::nullopt;
 }
+
+/// A timer for which no time passes.
+class Retry {
+public:
+    LoopTimer timer() {
+        return [this](std::chrono::microseconds delay, std::function<void()> function) {
+            const auto milliseconds = std::chrono::duration_cast<std::chrono::milliseconds>(delay).count();
+            say("retry in " + std::to_string(milliseconds) + " ms");
+            _function = std::move(function);
+            return LoopWatch();
+        };
+    }
+    /// The time has come.
+    void run() {
+        if (const auto function = std::exchange(_function, nullptr))
+            function();
+    }
+
+private:
+    std::function<void()> _function;
+};
 
 void run() {
     MainLoop loop;
@@ -58,12 +84,16 @@ void run() {
         if (!readLine())
             loop.quit();
     };
-    const SleepWatch watch(loop, logs, onSleep, [] { say("wake"); });
-    const LoopWatch input = loop.watch(STDIN_FILENO, [&loop] {
-        if (readLine())
-            say("pong");
-        else
-            loop.quit();
+    Retry retry;
+    const SleepWatch watch(
+        loop, logs, onSleep, [] { say("wake"); }, retry.timer());
+    const LoopWatch input = loop.watch(STDIN_FILENO, [&] {
+        const auto line = readLine();
+        if (!line)
+            return loop.quit();
+        if (*line == "retry")
+            retry.run();
+        say("pong");
     });
     say("ready");
     loop.run();

@@ -80,8 +80,8 @@ class Program:
             self._source = None
         return bool(text)
 
-    def say(self):
-        self.process.stdin.write(b"\n")
+    def say(self, line=""):
+        self.process.stdin.write(line.encode() + b"\n")
         self.process.stdin.flush()
 
     def wait_for(self, count):
@@ -93,9 +93,13 @@ class Program:
         taken, self.lines = self.lines[:count], self.lines[count:]
         return taken
 
-    def take_all(self):
+    def retry(self):
+        """All lines until it has tried to connect again."""
+        return self.take_all("retry")
+
+    def take_all(self, line=""):
         """All lines so far. The program serves, as it answers."""
-        self.say()
+        self.say(line)
         wait_until(lambda: self.lines and self.lines[-1] == "pong", lambda: f"an answer: {self.lines}")
         taken, self.lines = self.lines[:-1], []
         return taken
@@ -345,11 +349,54 @@ class SleepTest(unittest.TestCase):
 
     # --- The bus -----------------------------------------------------------------------------------------------
 
-    def test_no_bus_is_one_line(self):
+    def test_no_bus_is_one_line_and_it_is_looked_for_less_and_less_often(self):
         program = self.start_program()
         self.assertEqual(program.take_all(),
-                         ["log: no system bus: No such file or directory" + STAYS_DOWN, "ready"])
+                         ["log: no system bus: No such file or directory" + STAYS_DOWN, "retry in 250 ms", "ready"])
+        delays = [program.retry() for _ in range(8)]
+        self.assertEqual(delays, [[f"retry in {delay} ms"]
+                                  for delay in (500, 1000, 2000, 4000, 8000, 16000, 30000, 30000)])
         self.assertEqual(program.end(), 0)
+
+    def test_a_bus_that_comes_late_is_found(self):
+        program = self.start_program()
+        self.assertEqual(program.take(3)[1:], ["retry in 250 ms", "ready"])
+        self.start_bus()
+        self.start_logind()
+        self.assertEqual(program.retry(), [])
+        self.wait_for_inhibitors(1)
+        self.prepare_for_sleep(True)
+        self.assertEqual(program.take(1), ["sleep"])
+        program.say()
+        self.wait_for_inhibitors(0)
+
+    def test_a_bus_that_comes_again_is_found_and_may_go_again(self):
+        program = self.start_all()
+        for _ in range(2):
+            self.prepare_for_sleep(True)
+            self.assertEqual(program.take(1), ["sleep"])
+            program.say()
+            self.wait_for_inhibitors(0)
+            stop(self.broker)
+            stop(self.logind_process)
+            self.assertEqual(program.take(3), ["log: the system bus is gone" + STAYS_DOWN, "wake", "retry in 250 ms"])
+            self.assertEqual(program.retry(), ["retry in 500 ms"])
+            self.inhibitors.clear()
+            self.start_bus()
+            self.start_logind()
+            self.assertEqual(program.retry(), [])
+            self.wait_for_inhibitors(1)
+
+    def test_a_bus_that_closes_each_connection_is_tried_less_and_less_often(self):
+        with open_silent_socket(f"{self.folder.name}/bus") as listener:
+            program = self.start_program()
+            self.assertEqual(program.take(1), ["ready"])
+            listener.accept()[0].close()
+            self.assertEqual(program.take(2), ["log: the system bus is gone" + STAYS_DOWN, "retry in 250 ms"])
+            for delay in (500, 1000):
+                self.assertEqual(program.retry(), [])
+                listener.accept()[0].close()
+                self.assertEqual(program.take(1), [f"retry in {delay} ms"])
 
     def test_a_bus_that_says_nothing_keeps_nobody_waiting(self):
         with open_silent_socket(f"{self.folder.name}/bus"):
@@ -360,7 +407,7 @@ class SleepTest(unittest.TestCase):
     def test_a_bus_that_goes_away_is_one_line(self):
         program = self.start_all()
         stop(self.broker)
-        self.assertEqual(program.take(1), ["log: the system bus is gone" + STAYS_DOWN])
+        self.assertEqual(program.take(2), ["log: the system bus is gone" + STAYS_DOWN, "retry in 250 ms"])
         self.assertEqual(program.take_all(), [])
         self.assertEqual(program.end(), 0)
 
@@ -371,7 +418,7 @@ class SleepTest(unittest.TestCase):
         program.say()
         self.wait_for_inhibitors(0)
         stop(self.broker)
-        self.assertEqual(program.take(2), ["log: the system bus is gone" + STAYS_DOWN, "wake"])
+        self.assertEqual(program.take(3), ["log: the system bus is gone" + STAYS_DOWN, "wake", "retry in 250 ms"])
 
 
 def open_silent_socket(path):

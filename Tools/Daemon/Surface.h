@@ -20,10 +20,6 @@ namespace ZorvaTouch::Tools {
 /// Makes a surface's device, closed; it tells the observer what happens to it.
 using DeviceMaker = std::function<Ref<ZorvaDevice>(std::shared_ptr<Linux::HidrawObserver>)>;
 
-/// Has something called later, as `Linux::MainLoop::after` does.
-using LoopTimer =
-    std::function<Linux::LoopWatch(std::chrono::microseconds delay, std::function<void()> function)>;
-
 /// What all surfaces share. Borrowed but for the plug-in and the event system.
 struct SurfaceSurroundings {
     std::shared_ptr<const Host::PlugInFile> plugIn;
@@ -37,7 +33,7 @@ struct SurfaceSurroundings {
     /// none.
     std::function<unsigned()> threadFailures = {};
     DaemonLog log;
-    LoopTimer after = {}; ///< empty: the loop's own
+    Linux::LoopTimer after = {}; ///< empty: the loop's own
 
     [[nodiscard]] Linux::LoopWatch later(std::chrono::milliseconds delay, std::function<void()> function) {
         return after ? after(delay, std::move(function)) : loop.after(delay, std::move(function));

@@ -59,7 +59,7 @@ void Surfaces::onRemoved(const Linux::DeviceIdentity &device) {
 void Surfaces::onChanged(const Linux::DeviceIdentity &device) {
     for (Entry &entry : _entries)
         if (entry.syspath == device.syspath && !entry.surface) { // now it may be possible
-            entry.nextRetry = kFirstRetry;
+            entry.backOff.reset();
             open(entry);
         }
 }
@@ -85,14 +85,13 @@ void Surfaces::handleLoss(Entry &entry, const std::string &reason) {
     close(entry);
     _surroundings.listener.onSurface(entry.name, SurfaceState::Lost, reason);
     if (nowNs() - entry.openedNs >=
-        static_cast<std::uint64_t>(std::chrono::nanoseconds(kLongestRetry).count()))
-        entry.nextRetry = kFirstRetry;
+        static_cast<std::uint64_t>(std::chrono::nanoseconds(Linux::BackOff::kLongest).count()))
+        entry.backOff.reset();
     retryLater(entry);
 }
 
 void Surfaces::retryLater(Entry &entry) {
-    entry.retry = _surroundings.later(entry.nextRetry, [this, &entry] { open(entry); });
-    entry.nextRetry = std::min(entry.nextRetry * 2, kLongestRetry);
+    entry.retry = _surroundings.later(entry.backOff.next(), [this, &entry] { open(entry); });
 }
 
 void Surfaces::close(Entry &entry) {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "Host/Linux/BackOff.h"
 #include "Host/Linux/DeviceTracker.h"
 #include "Shared/Ports/Clock.h"
 #include "Tools/Daemon/Surface.h"
@@ -29,11 +30,6 @@ struct SurfaceHooks {
 /// Threads: the main thread.
 class Surfaces final : public Linux::DeviceListener {
 public:
-    /// The first try again comes so much later; each further one after twice as long, up to the longest. A
-    /// surface that has worked for the longest begins anew.
-    static constexpr std::chrono::milliseconds kFirstRetry{250};
-    static constexpr std::chrono::milliseconds kLongestRetry{30'000};
-
     /// @param clock  Tells how long a surface has worked. Borrowed.
     Surfaces(SurfaceSurroundings surroundings, DeviceFinder finder, Ports::Clock &clock, SurfaceHooks hooks);
     /// Closes all of them.
@@ -71,7 +67,7 @@ private:
         std::shared_ptr<Host::EventSystem> events;
         std::unique_ptr<Surface> surface = {}; ///< null while it does not work
         std::uint64_t openedNs = 0;
-        std::chrono::milliseconds nextRetry = kFirstRetry;
+        Linux::BackOff backOff = {}; ///< reset when the surface has worked for the longest delay
         Linux::LoopWatch retry = {};
         bool wantsReschedule = false;
         bool isInUse = false; ///< by another program, at the last attempt to open it

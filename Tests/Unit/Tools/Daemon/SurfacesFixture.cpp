@@ -25,7 +25,7 @@ constexpr int kHoldFrames = 52; ///< the time-out of 500 ms, and one
 
 ManualTimers::Wait::Wait(milliseconds of) : delay(of), due(::eventfd(0, EFD_CLOEXEC | EFD_NONBLOCK)) {}
 
-LoopTimer ManualTimers::timer() {
+Linux::LoopTimer ManualTimers::timer() {
     return [this](std::chrono::microseconds delay, std::function<void()> function) {
         const auto wait = std::make_shared<Wait>(std::chrono::duration_cast<milliseconds>(delay));
         _waits.push_back(wait);

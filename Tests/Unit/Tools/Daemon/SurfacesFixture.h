@@ -36,7 +36,7 @@ class ManualTimers {
 public:
     explicit ManualTimers(Linux::MainLoop &loop) : _loop(loop) {}
 
-    [[nodiscard]] LoopTimer timer();
+    [[nodiscard]] Linux::LoopTimer timer();
     // Watching over the silence of a device that holds a key is a matter of its own.
 
     /// What is waited for, in the order in which it was asked.
