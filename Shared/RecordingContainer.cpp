@@ -7,11 +7,15 @@
 #include <algorithm>
 #include <array>
 #include <cmath>
+#include <initializer_list>
 #include <utility>
 #include <vector>
 
 namespace ZorvaTouch {
 namespace {
+
+constexpr const char *kMigrationFailed = "migrateSerializedContainer failed: ";
+constexpr const char *kInvalidContainer = "invalid container";
 
 constexpr std::string_view kVersionKey = "Version";
 constexpr std::string_view kFramesKey = "Frames";
@@ -107,11 +111,12 @@ std::optional<FrameType> typeOf(const FrameMembers &members) {
     return entry == kTypeNames.end() ? std::nullopt : std::optional(entry->type);
 }
 
-/// Turns frame objects into frames, one after the other, and says what is wrong with one and which it is.
+/// Turns frame objects of the current version into frames, one after the other.
 class FrameReader {
 public:
     FrameList takeFrames() { return std::move(_frames); }
 
+    /// @throws FrameError
     void read(Util::JsonValue value) {
         const FrameMembers members = readMembers(value);
         const auto type = typeOf(members);
@@ -160,38 +165,6 @@ private:
     std::vector<std::uint8_t> _report; ///< kept for its capacity
 };
 
-/// The members of a container object that count; of equal names the last one.
-struct ContainerMembers {
-    Member version, frames;
-};
-
-ContainerMembers readContainerMembers(Util::JsonValue root) {
-    ContainerMembers members;
-    if (root.kind() != Util::JsonValue::Kind::Object)
-        return members;
-    Util::JsonObjectReader reader(root);
-    std::string_view name;
-    Util::JsonValue value;
-    while (reader.next(name, value)) {
-        if (name == kVersionKey)
-            members.version = value;
-        else if (name == kFramesKey)
-            members.frames = value;
-    }
-    return members;
-}
-
-FrameList readFrames(const Member &frames) {
-    if (!frames || frames->kind() != Util::JsonValue::Kind::Array)
-        throw std::invalid_argument("invalid frames");
-    FrameReader reader;
-    Util::JsonArrayReader elements(*frames);
-    Util::JsonValue element;
-    while (elements.next(element))
-        reader.read(element);
-    return reader.takeFrames();
-}
-
 // --- Migration
 
 /// A container's version if it is one that is known.
@@ -219,16 +192,20 @@ std::string versionText(const PropertyValue &version) {
     return text;
 }
 
-std::uint64_t versionOf(const PropertyValue &object) {
-    if (!object.asDictionary())
-        throw std::invalid_argument("invalid container");
-    const PropertyValue *version = object.find(kVersionKey);
+/// The known version that a container's member gives; null if there is no such member.
+std::uint64_t versionFrom(const PropertyValue *version) {
     if (!version || !(version->asUnsigned() || version->asDouble())) // a boolean is no number here
         throw std::invalid_argument("invalid version");
     const auto known = knownVersion(*version);
     if (!known)
         throw std::invalid_argument("invalid container version: " + versionText(*version));
     return *known;
+}
+
+std::uint64_t versionOf(const PropertyValue &object) {
+    if (!object.asDictionary())
+        throw std::invalid_argument(kInvalidContainer);
+    return versionFrom(object.find(kVersionKey));
 }
 
 PropertyValue containerOf(std::uint64_t version, PropertyValue frames) {
@@ -295,57 +272,190 @@ PropertyValue migrateRecordingContainer(const PropertyValue &object) {
     }
 }
 
+// --- Reading
+
+ContainerError::ContainerError(const Util::JsonError &error) : ContainerError(kInvalidContainer) {
+    reason = error.what();
+    offset = error.offset;
+}
+
+ContainerError::ContainerError(const std::string &statedProblem, std::optional<std::size_t> index)
+    : std::runtime_error(kMigrationFailed + statedProblem), problem(statedProblem), frameIndex(index) {}
+
 namespace {
 
-constexpr const char *kMigrationFailed = "migrateSerializedContainer failed: ";
-
-Util::JsonDocument parseContainer(std::string_view jsonText) {
-    std::string reason;
-    auto document = Util::JsonDocument::parse(jsonText, &reason);
-    if (!document)
-        throw ContainerError(std::string(kMigrationFailed) + "invalid container", std::nullopt,
-                             std::move(reason));
-    return std::move(*document);
+PropertyValue currentFrameFromReport(const PropertyValue &report, std::size_t index) {
+    return frameWithData(frameFromReport(report, index), index);
 }
 
-PropertyValue migrateForReading(const PropertyValue &object) {
-    try {
-        return migrateRecordingContainer(object);
-    } catch (const FrameError &error) {
-        throw ContainerError(kMigrationFailed + std::string(error.what()), error.frameIndex, {});
-    } catch (const std::invalid_argument &error) {
-        throw ContainerError(kMigrationFailed + std::string(error.what()), std::nullopt, {});
+/// The list of frames as one version of the container reads it.
+///
+/// A text must be JSON up to its end, and its version may stand behind its frames, before anything can be
+/// wrong with a frame. So failures are kept until the frames are asked for.
+class FramesMember {
+public:
+    /// @param migrate  One element into a frame of the current version; null for the current version.
+    using Migrate = PropertyValue (*)(const PropertyValue &element, std::size_t index);
+    explicit FramesMember(Migrate migrate) : _migrate(migrate) {}
+
+    /// The container has the member. Of equal names the last one holds.
+    void begin(bool isArray) { *this = FramesMember(_migrate, isArray); }
+
+    void read(Util::JsonValue element) {
+        const std::size_t index = _count++;
+        if (_migrationFailure)
+            return;
+        if (!_migrate)
+            return readCurrent(element);
+        PropertyValue migrated;
+        try {
+            migrated = _migrate(element.toPropertyValue(), index);
+        } catch (const FrameError &error) {
+            _migrationFailure = error;
+            _reader = {};
+            return;
+        }
+        readCurrent(*_parser.parse(Util::jsonText(migrated)));
     }
-}
+
+    /// @throws FrameError, ContainerError  The first failure.
+    [[nodiscard]] FrameList take() {
+        if (_migrationFailure)
+            throw ContainerError(_migrationFailure->what(), _migrationFailure->frameIndex);
+        const bool mayBeMissing = _migrate; // in older versions that is an empty list
+        if (!_isArray.value_or(mayBeMissing))
+            throw std::invalid_argument("invalid frames");
+        if (_failure)
+            throw FrameError(*_failure);
+        return _reader.takeFrames();
+    }
+
+private:
+    FramesMember(Migrate migrate, bool isArray) : _migrate(migrate), _isArray(isArray) {}
+
+    void readCurrent(Util::JsonValue element) {
+        if (_failure)
+            return;
+        try {
+            _reader.read(element);
+        } catch (const FrameError &error) {
+            _failure = error;
+            _reader = {};
+        }
+    }
+
+    Migrate _migrate;
+    std::optional<bool> _isArray; ///< nothing: the member is missing
+    std::size_t _count = 0;       ///< of elements
+    FrameReader _reader;
+    Util::JsonParser _parser; ///< of migrated elements
+    std::optional<FrameError> _migrationFailure, _failure;
+};
+
+/// Reads a container while its text arrives. What is read depends on the version, and that may come last: the
+/// frames are read as each version has them. A list of another version fails at its first report, so that
+/// costs next to nothing.
+class ContainerReader {
+public:
+    explicit ContainerReader(Util::TextPieces pieces) : _stream(std::move(pieces)) {}
+
+    [[nodiscard]] RecordingContainer read() {
+        const bool isObject = _stream.isAtObject();
+        if (isObject)
+            readMembers();
+        else
+            static_cast<void>(_stream.value());
+        _stream.finish();
+        if (!isObject)
+            throw ContainerError(kInvalidContainer);
+        const std::uint64_t version = requireVersion();
+        return {version, framesOf(version).take()};
+    }
+
+private:
+    void readMembers() {
+        _stream.enter();
+        std::string name;
+        while (_stream.nextMember(name)) {
+            if (name == kFramesKey)
+                readList({&_current, &_version1});
+            else if (name == kReportsKey)
+                readList({&_version0});
+            else if (const Util::JsonValue value = _stream.value(); name == kVersionKey)
+                _version = value.toPropertyValue();
+        }
+    }
+
+    void readList(std::initializer_list<FramesMember *> members) {
+        const bool isArray = _stream.isAtArray();
+        for (FramesMember *member : members)
+            member->begin(isArray);
+        if (!isArray) {
+            static_cast<void>(_stream.value());
+            return;
+        }
+        _stream.enter();
+        while (_stream.nextElement()) {
+            const Util::JsonValue element = _stream.value();
+            for (FramesMember *member : members)
+                member->read(element);
+        }
+    }
+
+    [[nodiscard]] std::uint64_t requireVersion() const {
+        try {
+            return versionFrom(_version ? &*_version : nullptr);
+        } catch (const std::invalid_argument &error) {
+            throw ContainerError(error.what());
+        }
+    }
+
+    [[nodiscard]] FramesMember &framesOf(std::uint64_t version) {
+        if (version == kCurrentVersion)
+            return _current;
+        return version == 0 ? _version0 : _version1;
+    }
+
+    Util::JsonStream _stream;
+    std::optional<PropertyValue> _version;
+    FramesMember _current{nullptr};
+    FramesMember _version1{frameWithData};
+    FramesMember _version0{currentFrameFromReport};
+};
 
 } // namespace
 
-RecordingContainer readRecordingContainer(std::string_view jsonText) {
-    const Util::JsonDocument document = parseContainer(jsonText);
-    const ContainerMembers members = readContainerMembers(document.root());
-    if (members.version && knownVersion(members.version->toPropertyValue()) == kCurrentVersion)
-        return {kCurrentVersion, readFrames(members.frames)};
-
-    // An older container is migrated as a whole and then read like any other; that keeps one road for frames.
-    const PropertyValue object = document.root().toPropertyValue();
-    const std::string migrated = Util::jsonText(migrateForReading(object));
-    const Util::JsonDocument current = parseContainer(migrated);
-    return {versionOf(object), readFrames(readContainerMembers(current.root()).frames)};
+RecordingContainer readRecordingContainer(Util::TextPieces pieces) {
+    try {
+        return ContainerReader(std::move(pieces)).read();
+    } catch (const Util::JsonError &error) {
+        throw ContainerError(error);
+    }
 }
 
+RecordingContainer readRecordingContainer(std::string_view jsonText) {
+    return readRecordingContainer(Util::piecesOf(jsonText));
+}
+
+ContainerWriter::ContainerWriter() : _text(R"({"Version":2,"Frames":[)") {}
+
+void ContainerWriter::append(const FrameView &frame) {
+    if (!hasName(frame.type))
+        return;
+    if (!std::exchange(_isFirst, false))
+        _text.push_back(',');
+    appendFrame(_text, frame);
+}
+
+void ContainerWriter::finish() { _text.append("]}"); }
+
 std::string writeRecordingContainer(const FrameList &frames) {
-    std::string text = R"({"Version":2,"Frames":[)";
-    text.reserve(text.size() + frames.size() * kTypicalFrameLength);
-    const char *separator = "";
-    for (const FrameView &frame : frames) {
-        if (!hasName(frame.type)) // a kind that the format does not know
-            continue;
-        text.append(separator);
-        appendFrame(text, frame);
-        separator = ",";
-    }
-    text.append("]}");
-    return text;
+    ContainerWriter writer;
+    writer.text().reserve(writer.text().size() + frames.size() * kTypicalFrameLength);
+    for (const FrameView &frame : frames)
+        writer.append(frame);
+    writer.finish();
+    return std::move(writer.text());
 }
 
 } // namespace ZorvaTouch

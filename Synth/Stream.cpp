@@ -112,12 +112,15 @@ void Stream::note(const char *key, PropertyValue value, Microseconds time) {
 }
 
 FrameList synthesize(const Scenario &scenario, const Parameters &parameters, std::uint64_t seed,
-                     double seconds) {
+                     double seconds, const std::function<void(Microseconds made)> &onAdvance) {
     const Microseconds end = microseconds(seconds);
     Stream stream(scenario, parameters, seed, end - std::min(end, kTail));
     FrameList frames;
-    for (Frame frame = stream.next(); stream.now() < end; frame = stream.next())
+    for (Frame frame = stream.next(); stream.now() < end; frame = stream.next()) {
         frames.append(std::move(frame));
+        if (onAdvance)
+            onAdvance(stream.now());
+    }
     return frames;
 }
 

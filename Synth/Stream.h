@@ -13,6 +13,7 @@
 
 #include <cstdint>
 #include <deque>
+#include <functional>
 
 namespace ZorvaTouch::Synth {
 
@@ -67,8 +68,10 @@ private:
 };
 
 /// A whole recording: what a stream gives in a time, as long as all its contacts are over by then.
-/// @param seconds  Not negative.
+/// @param seconds    Not negative.
+/// @param onAdvance  If given, called at each frame with the time that has been made so far.
 [[nodiscard]] FrameList synthesize(const Scenario &scenario, const Parameters &parameters, std::uint64_t seed,
-                                   double seconds);
+                                   double seconds,
+                                   const std::function<void(Microseconds made)> &onAdvance = {});
 
 } // namespace ZorvaTouch::Synth

@@ -65,31 +65,19 @@ std::optional<struct stat> statusOf(const std::string &path) {
     return ::stat(path.c_str(), &status) == 0 ? std::optional(status) : std::nullopt;
 }
 
-/// Bytes to ask for so that a regular file is read in one go and its end is seen in the next.
-std::size_t firstReadSize(int descriptor) {
-    constexpr std::size_t kChunk = 64 * 1024;
+/// Bytes of a regular file; 0 for anything else.
+std::uint64_t sizeOf(int descriptor) {
     struct stat status {};
     if (::fstat(descriptor, &status) != 0 || !S_ISREG(status.st_mode) || status.st_size < 0)
-        return kChunk;
-    return std::max<std::size_t>(static_cast<std::size_t>(status.st_size) + 1, kChunk);
+        return 0;
+    return static_cast<std::uint64_t>(status.st_size);
 }
 
-std::string readAll(int descriptor) {
-    std::string text(firstReadSize(descriptor), '\0');
-    std::size_t length = 0;
-    for (;;) {
-        if (length == text.size())
-            text.resize(text.size() * 2);
-        const auto count =
-            uninterrupted([&] { return ::read(descriptor, text.data() + length, text.size() - length); });
-        if (count < 0)
-            throw FileFailure("read", errno);
-        if (count == 0)
-            break;
-        length += static_cast<std::size_t>(count);
-    }
-    text.resize(length);
-    return text;
+std::size_t readSome(int descriptor, char *to, std::size_t size) {
+    const auto count = uninterrupted([&] { return ::read(descriptor, to, size); });
+    if (count < 0)
+        throw FileFailure("read", errno);
+    return static_cast<std::size_t>(count);
 }
 
 void writeAll(int descriptor, std::string_view text) {
@@ -179,9 +167,33 @@ void requireRegularOrNothing(const std::string &path) {
 
 } // namespace
 
-std::string readFile(const std::string &path) { return readAll(openFile(path, O_RDONLY).number()); }
+Input openInput(const std::string &path) {
+    const auto file = std::make_shared<Descriptor>(openFile(path, O_RDONLY));
+    return {.read = [file](char *to, std::size_t size) { return readSome(file->number(), to, size); },
+            .size = sizeOf(file->number())};
+}
 
-std::string readStandardInput() { return readAll(static_cast<int>(StandardStream::Input)); }
+Input openStandardInput() {
+    constexpr int kDescriptor = static_cast<int>(StandardStream::Input);
+    return {.read = [](char *to, std::size_t size) { return readSome(kDescriptor, to, size); },
+            .size = sizeOf(kDescriptor)};
+}
+
+std::string readAll(const Input &input) {
+    constexpr std::size_t kLeast = 64 * 1024;
+    // A regular file is read in one go and its end is seen in the next.
+    std::string text(std::max<std::size_t>(input.size + 1, kLeast), '\0');
+    std::size_t length = 0;
+    while (const std::size_t count = input.read(text.data() + length, text.size() - length)) {
+        length += count;
+        if (length == text.size())
+            text.resize(text.size() * 2);
+    }
+    text.resize(length);
+    return text;
+}
+
+std::string readFile(const std::string &path) { return readAll(openInput(path)); }
 
 void replaceFile(const std::string &path, std::string_view contents) {
     const std::optional<struct stat> old = statusOf(path);

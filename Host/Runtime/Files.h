@@ -1,5 +1,8 @@
 #pragma once
 
+#include <cstddef>
+#include <cstdint>
+#include <functional>
 #include <string>
 #include <string_view>
 #include <system_error>
@@ -24,9 +27,23 @@ enum class StandardStream : int { Input = 0, Output = 1, Error = 2 };
 /// @throws FileFailure
 [[nodiscard]] std::string readFile(const std::string &path);
 
-/// Reads standard input up to its end.
+/// A file that is open for reading.
+struct Input {
+    /// Reads up to `size` bytes to `to` and returns how many; 0 at the end. Keeps the file open.
+    /// @throws FileFailure
+    std::function<std::size_t(char *to, std::size_t size)> read;
+    std::uint64_t size = 0; ///< bytes of a regular file; 0 if unknown
+};
+
+/// Opens a file, or whatever else can be opened under that name.
 /// @throws FileFailure
-[[nodiscard]] std::string readStandardInput();
+[[nodiscard]] Input openInput(const std::string &path);
+/// Standard input, from where it stands.
+[[nodiscard]] Input openStandardInput();
+
+/// Reads up to the end.
+/// @throws FileFailure
+[[nodiscard]] std::string readAll(const Input &input);
 
 /// Gives a file new contents: they are written to a temporary file in the same folder, flushed to the disk
 /// and renamed, so that under `path` there is always the whole old file or the whole new one. An existing

@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <bit>
 #include <cmath>
+#include <new>
 #include <simdjson.h>
 #include <type_traits>
 
@@ -128,7 +129,8 @@ bool nestsDeeperThan(std::size_t levels, dom::element element) {
 
 simdjson::error_code parseWithin(std::size_t depth, dom::parser &parser, std::string_view text,
                                  dom::element &root) {
-    if (const auto code = parser.allocate(text.size(), depth); code != simdjson::SUCCESS)
+    const std::size_t capacity = std::max(parser.capacity(), text.size()); // it never shrinks
+    if (const auto code = parser.allocate(capacity, depth); code != simdjson::SUCCESS)
         return code;
     return parser.parse(text.data(), text.size()).get(root);
 }
@@ -136,14 +138,35 @@ simdjson::error_code parseWithin(std::size_t depth, dom::parser &parser, std::st
 /// The library's limit is one level off for containers that are not empty: within N levels it takes N if the
 /// innermost container is empty and N - 1 otherwise. So what it refuses for depth gets a second look with one
 /// more.
-simdjson::error_code parseText(dom::parser &parser, std::string_view text, dom::element &root) {
-    const auto code = parseWithin(kJsonMaxDepth, parser, text, root);
+simdjson::error_code parseText(std::size_t levels, dom::parser &parser, std::string_view text,
+                               dom::element &root) {
+    const auto code = parseWithin(levels, parser, text, root);
     if (code != simdjson::DEPTH_ERROR)
         return code;
-    const auto second = parseWithin(kJsonMaxDepth + 1, parser, text, root);
-    if (second == simdjson::SUCCESS && nestsDeeperThan(kJsonMaxDepth, root))
+    const auto second = parseWithin(levels + 1, parser, text, root);
+    if (second == simdjson::SUCCESS && nestsDeeperThan(levels, root))
         return simdjson::DEPTH_ERROR;
     return second;
+}
+
+/// What is wrong, in a few words.
+std::string_view reasonFor(simdjson::error_code code) {
+    switch (code) {
+    case simdjson::CAPACITY:
+        return "4 GiB or more";
+    case simdjson::DEPTH_ERROR:
+        return "more than 64 levels of nesting";
+    case simdjson::UTF8_ERROR:
+        return "malformed UTF-8";
+    case simdjson::NUMBER_ERROR:
+        return "malformed number, or number out of range";
+    case simdjson::STRING_ERROR:
+    case simdjson::UNCLOSED_STRING:
+    case simdjson::UNESCAPED_CHARS:
+        return "malformed string";
+    default:
+        return "not JSON";
+    }
 }
 
 } // namespace
@@ -238,18 +261,17 @@ bool JsonObjectReader::next(std::string_view &key, JsonValue &value) noexcept {
     return true;
 }
 
-struct JsonDocument::Tape {
+struct JsonParser::Tape {
     dom::parser parser;
 };
 
-JsonDocument::JsonDocument(std::unique_ptr<Tape> tape, JsonValue root) noexcept
-    : _tape(std::move(tape)), _root(root) {}
-JsonDocument::JsonDocument(JsonDocument &&) noexcept = default;
-JsonDocument &JsonDocument::operator=(JsonDocument &&) noexcept = default;
-JsonDocument::~JsonDocument() = default;
+JsonParser::JsonParser() : _tape(std::make_unique<Tape>()) {}
+JsonParser::JsonParser(JsonParser &&) noexcept = default;
+JsonParser &JsonParser::operator=(JsonParser &&) noexcept = default;
+JsonParser::~JsonParser() = default;
 
-std::optional<JsonDocument> JsonDocument::parse(std::string_view text, std::string *error) {
-    const auto refuse = [error](std::string_view reason) -> std::optional<JsonDocument> {
+std::optional<JsonValue> JsonParser::parse(std::string_view text, std::string *error, std::size_t levels) {
+    const auto refuse = [error](std::string_view reason) -> std::optional<JsonValue> {
         if (error)
             *error = reason;
         return std::nullopt;
@@ -258,13 +280,21 @@ std::optional<JsonDocument> JsonDocument::parse(std::string_view text, std::stri
         return refuse("the text is empty");
     if (text.starts_with(kByteOrderMark))
         return refuse("the text begins with a byte-order mark");
-    auto tape = std::make_unique<Tape>();
     dom::element root;
-    if (const auto code = parseText(tape->parser, text, root); code != simdjson::SUCCESS)
-        return refuse(simdjson::error_message(code));
+    const auto code = parseText(levels, _tape->parser, text, root);
+    if (code == simdjson::MEMALLOC)
+        throw std::bad_alloc();
+    if (code != simdjson::SUCCESS)
+        return refuse(reasonFor(code));
     JsonValue value;
     value._handle = toHandle<JsonValue::Handle>(root);
-    return JsonDocument(std::move(tape), value);
+    return value;
+}
+
+std::optional<JsonDocument> JsonDocument::parse(std::string_view text, std::string *error) {
+    JsonParser parser;
+    const auto root = parser.parse(text, error);
+    return root ? std::optional(JsonDocument(std::move(parser), *root)) : std::nullopt;
 }
 
 std::optional<PropertyValue> parseJson(std::string_view text) {

@@ -9,6 +9,7 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <utility>
 
 /// JSON text in and out. The library behind it is seen in Json.cpp only.
 namespace ZorvaTouch::Util {
@@ -31,7 +32,7 @@ public:
     [[nodiscard]] PropertyValue toPropertyValue() const;
 
 private:
-    friend class JsonDocument;
+    friend class JsonParser;
     friend class JsonArrayReader;
     friend class JsonObjectReader;
     using Handle = std::array<std::uintptr_t, 2>; ///< the library's own handle, opaque here
@@ -63,33 +64,49 @@ private:
     JsonValue::Handle _at, _end;
 };
 
+/// Parses JSON texts one after the other and keeps its memory for the next one.
+class JsonParser {
+public:
+    JsonParser();
+    JsonParser(JsonParser &&) noexcept;
+    JsonParser &operator=(JsonParser &&) noexcept;
+    ~JsonParser();
+
+    /// Parses one whole JSON text.
+    ///
+    /// Refused are: a byte-order mark, malformed UTF-8, unpaired surrogates, numbers out of the range of a
+    /// double or integers above 2^64-1, anything but white space after the value, more than `levels` levels
+    /// of nesting, and texts of 4 GiB or more.
+    ///
+    /// @param text    Borrowed for the call.
+    /// @param error   If given, receives a short reason in English when the result is empty.
+    /// @param levels  At most `kJsonMaxDepth`.
+    /// @return The root, valid until the next call.
+    /// @throws std::bad_alloc
+    [[nodiscard]] std::optional<JsonValue> parse(std::string_view text, std::string *error = nullptr,
+                                                 std::size_t levels = kJsonMaxDepth);
+
+private:
+    struct Tape;
+
+    std::unique_ptr<Tape> _tape;
+};
+
 /// A parsed JSON text.
 ///
 /// Threads: reading a finished document is safe from several threads.
 class JsonDocument {
 public:
-    /// Parses one whole JSON text.
-    ///
-    /// Refused are: a byte-order mark, malformed UTF-8, unpaired surrogates, numbers out of the range of a
-    /// double or integers above 2^64-1, anything but white space after the value, more than `kJsonMaxDepth`
-    /// levels, and texts of 4 GiB or more.
-    ///
-    /// @param text   Borrowed for the call.
-    /// @param error  If given, receives a short reason in English when the result is empty.
+    /// Parses one whole JSON text as `JsonParser::parse` does.
     [[nodiscard]] static std::optional<JsonDocument> parse(std::string_view text,
                                                            std::string *error = nullptr);
-
-    JsonDocument(JsonDocument &&) noexcept;
-    JsonDocument &operator=(JsonDocument &&) noexcept;
-    ~JsonDocument();
 
     [[nodiscard]] JsonValue root() const noexcept { return _root; }
 
 private:
-    struct Tape;
-    JsonDocument(std::unique_ptr<Tape> tape, JsonValue root) noexcept;
+    JsonDocument(JsonParser parser, JsonValue root) noexcept : _parser(std::move(parser)), _root(root) {}
 
-    std::unique_ptr<Tape> _tape;
+    JsonParser _parser; ///< keeps what the root refers to
     JsonValue _root;
 };
 

@@ -5,8 +5,9 @@
 namespace ZorvaTouch::Tools {
 
 ExitStatus runConvert(const ConvertOptions &options, Environment &environment) {
-    const FrameList frames = readRecording(options.in, environment).frames;
-    writeDocument(options.out, writeRecordingContainer(frames), environment);
+    Progress progress(environment, inputTitle(options.in));
+    const FrameList frames = readRecording(options.in, environment, progress).frames;
+    writeRecording(options.out, frames, environment, progress);
     return kExitDone;
 }
 

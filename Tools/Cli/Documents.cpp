@@ -3,18 +3,39 @@
 #include "Host/Runtime/Files.h"
 #include "Tools/Cli/CliError.h"
 
-#include <optional>
+#include <cstdint>
+#include <utility>
 
 namespace ZorvaTouch::Tools {
 namespace {
 
 std::string shown(const std::string &name) { return name.empty() ? "''" : name; }
 
-std::string placeOf(const std::string &name, std::optional<std::size_t> frameIndex) {
-    std::string place = inputTitle(name) + ": ";
-    if (frameIndex)
-        place.append("frame ").append(std::to_string(*frameIndex)).append(": ");
-    return place;
+std::string frameError(const std::string &name, std::size_t index, const char *problem) {
+    return inputTitle(name) + ": frame " + std::to_string(index) + ": " + problem;
+}
+
+std::string notARecording(const std::string &name, const std::string &reason) {
+    return inputTitle(name) + ": not a ZorvaTouch recording (" + reason + ")";
+}
+
+std::string reasonOf(const ContainerError &error) {
+    return error.reason.empty() ? error.problem : error.reason + ", byte " + std::to_string(error.offset);
+}
+
+Host::Input openDocument(const std::string &name, Environment &environment) {
+    return name == kStandardStreamName ? environment.openInput() : Host::openInput(name);
+}
+
+/// The pieces of a text, counted on a bar.
+Util::TextPieces watchedPieces(Host::Input input, Progress &progress) {
+    progress.begin("reading", input.size);
+    return [read = std::move(input.read), &progress, done = std::uint64_t{0}](char *to,
+                                                                              std::size_t size) mutable {
+        const std::size_t count = read(to, size);
+        progress.update(done += count);
+        return count;
+    };
 }
 
 } // namespace
@@ -25,24 +46,31 @@ std::string inputTitle(const std::string &name) {
 
 std::string readDocument(const std::string &name, Environment &environment) {
     try {
-        return name == kStandardStreamName ? environment.readInput() : Host::readFile(name);
+        return Host::readAll(openDocument(name, environment));
     } catch (const Host::FileFailure &failure) {
         throw fileError(inputTitle(name), failure);
     }
 }
 
-RecordingContainer readRecording(const std::string &name, Environment &environment) {
-    const std::string text = readDocument(name, environment);
+RecordingContainer readRecording(const std::string &name, Environment &environment, Progress &progress) {
     try {
-        return readRecordingContainer(text);
+        return readRecordingContainer(watchedPieces(openDocument(name, environment), progress));
+    } catch (const Host::FileFailure &failure) {
+        throw fileError(inputTitle(name), failure);
     } catch (const FrameError &error) {
-        throw CliError(placeOf(name, error.frameIndex) + error.what());
+        throw CliError(frameError(name, error.frameIndex, error.what()));
     } catch (const ContainerError &error) {
-        const std::string reason = error.reason.empty() ? "" : " (" + error.reason + ")";
-        throw CliError(placeOf(name, error.frameIndex) + error.what() + reason);
+        if (error.frameIndex)
+            throw CliError(frameError(name, *error.frameIndex, error.problem.c_str()));
+        throw CliError(notARecording(name, reasonOf(error)));
     } catch (const std::invalid_argument &error) {
-        throw CliError(placeOf(name, std::nullopt) + error.what());
+        throw CliError(notARecording(name, error.what()));
     }
+}
+
+RecordingContainer readRecording(const std::string &name, Environment &environment) {
+    Progress progress(environment, inputTitle(name));
+    return readRecording(name, environment, progress);
 }
 
 void writeDocument(const std::string &name, std::string_view text, Environment &environment) {
@@ -53,6 +81,19 @@ void writeDocument(const std::string &name, std::string_view text, Environment &
     } catch (const Host::FileFailure &failure) {
         throw fileError(shown(name), failure);
     }
+}
+
+void writeRecording(const std::string &name, const FrameList &frames, Environment &environment,
+                    Progress &progress) {
+    ContainerWriter writer;
+    std::size_t done = 0;
+    progress.begin("writing", frames.size());
+    for (const FrameView &frame : frames) {
+        writer.append(frame);
+        progress.update(++done);
+    }
+    writer.finish();
+    writeDocument(name, writer.text(), environment);
 }
 
 } // namespace ZorvaTouch::Tools

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "Host/Runtime/Files.h"
 #include "Shared/Ports/Clock.h"
 #include "Shared/Ports/Log.h"
 #include "Tools/Cli/Output.h"
@@ -13,7 +14,7 @@ namespace ZorvaTouch::Tools {
 
 /// What the program has around it: standard streams, time, logs. Tests hand in doubles.
 struct Environment {
-    std::function<std::string()> readInput; ///< all of standard input; throws Host::FileFailure
+    std::function<Host::Input()> openInput; ///< standard input
     Output output;                          ///< standard output
     Output errorOutput;                     ///< standard error
     Ports::Clock &clock;

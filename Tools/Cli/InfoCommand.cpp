@@ -141,7 +141,9 @@ void appendForPrograms(std::string &text, const RecordingInfo &info, const std::
 ExitStatus runInfo(const InfoOptions &options, Environment &environment) {
     for (const std::string &file : options.files) {
         const std::string title = inputTitle(file);
-        const RecordingInfo info = inspectRecording(readRecording(file, environment), title, environment);
+        Progress progress(environment, title);
+        const RecordingInfo info =
+            inspectRecording(readRecording(file, environment, progress), environment, progress);
         if (options.json)
             appendForPrograms(environment.output.text(), info, file);
         else

@@ -61,7 +61,7 @@ int main(int argc, char **argv) {
     StandardSink errorOutput(Host::StandardStream::Error);
     Host::SteadyClock clock;
     Tools::Environment environment{
-        .readInput = Host::readStandardInput,
+        .openInput = Host::openStandardInput,
         .output = {output, "standard output"},
         .errorOutput = {errorOutput, "standard error"},
         .clock = clock,

@@ -21,7 +21,8 @@ Stimulus readStimulus(const std::string &name, Environment &environment) {
 
 ExitStatus runMake(const MakeOptions &options, Environment &environment) {
     const Stimulus stimulus = readStimulus(options.in, environment);
-    writeDocument(options.out, writeRecordingContainer(stimulus.frames), environment);
+    Progress progress(environment, inputTitle(options.in));
+    writeRecording(options.out, stimulus.frames, environment, progress);
     return kExitDone;
 }
 

@@ -1,7 +1,5 @@
 #include "Tools/Cli/RecordingInfo.h"
 
-#include "Tools/Cli/Progress.h"
-
 #include <algorithm>
 #include <numeric>
 #include <utility>
@@ -81,12 +79,11 @@ std::size_t RecordingInfo::frames() const noexcept {
     return std::accumulate(frameCounts.begin(), frameCounts.end(), std::size_t{0});
 }
 
-RecordingInfo inspectRecording(RecordingContainer recording, const std::string &title,
-                               Environment &environment) {
+RecordingInfo inspectRecording(RecordingContainer recording, Environment &environment, Progress &progress) {
     RecordingInfo info;
     info.version = recording.version;
     Replay replay(std::move(recording.frames), environment.clock, Ports::silentLogProvider());
-    Progress progress(environment, title, replay.frames().size());
+    progress.begin("replaying", replay.frames().size());
     Inspector inspector(info);
     while (replay.next()) {
         inspector.note(replay);

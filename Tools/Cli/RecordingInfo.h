@@ -4,6 +4,7 @@
 #include "Shared/Util/PropertyValue.h"
 #include "Tools/Cli/Environment.h"
 #include "Tools/Cli/GestureCounts.h"
+#include "Tools/Cli/Progress.h"
 #include "Tools/Stimulus/Replay.h"
 
 #include <array>
@@ -48,8 +49,8 @@ struct RecordingInfo {
 };
 
 /// Replays the recording and takes notes.
-/// @param title  For the progress bar.
-[[nodiscard]] RecordingInfo inspectRecording(RecordingContainer recording, const std::string &title,
-                                             Environment &environment);
+/// @param progress  Shows a part "replaying".
+[[nodiscard]] RecordingInfo inspectRecording(RecordingContainer recording, Environment &environment,
+                                             Progress &progress);
 
 } // namespace ZorvaTouch::Tools

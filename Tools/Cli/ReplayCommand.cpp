@@ -19,17 +19,23 @@ std::unique_ptr<ReplayPrinter> makePrinter(const ReplayOptions &options, Environ
 }
 
 std::unique_ptr<Replay> openReplay(const std::string &file, const ReplayOptions &options,
-                                   Environment &environment, Ports::LogProvider &logs) {
-    auto replay = std::make_unique<Replay>(readRecording(file, environment).frames, environment.clock, logs);
+                                   Environment &environment, Ports::LogProvider &logs, Progress &progress) {
+    auto replay =
+        std::make_unique<Replay>(readRecording(file, environment, progress).frames, environment.clock, logs);
     for (const Setting &setting : options.settings)
         replay->setState(setting.key, setting.value);
     return replay;
 }
 
-void play(Replay &replay, const std::string &title, const ReplayOptions &options, Environment &environment,
-          ReplayPrinter &printer) {
+/// Reads a recording and plays it.
+void play(const std::string &file, const ReplayOptions &options, Environment &environment,
+          Ports::LogProvider &logs, ReplayPrinter &printer) {
+    const std::string title = inputTitle(file);
+    Progress progress(environment, title);
+    const auto opened = openReplay(file, options, environment, logs, progress);
+    Replay &replay = *opened;
     const bool isWatched = std::isfinite(options.speed); // then each gesture is shown as it happens
-    Progress progress(environment, title, replay.frames().size());
+    progress.begin("replaying", replay.frames().size());
     printer.begin(title, replay);
     while (replay.next(options.speed)) {
         printer.print(replay);
@@ -42,9 +48,8 @@ void play(Replay &replay, const std::string &title, const ReplayOptions &options
 
 ExitStatus runExpect(const ReplayOptions &options, Environment &environment, Ports::LogProvider &logs) {
     const std::string expected = readDocument(*options.expectFile, environment);
-    const auto replay = openReplay(options.files.front(), options, environment, logs);
     ReplayExpecter expecter(expected, inputTitle(*options.expectFile), options.describe, environment.output);
-    play(*replay, inputTitle(options.files.front()), options, environment, expecter);
+    play(options.files.front(), options, environment, logs, expecter);
     expecter.finish();
     return expecter.differs() ? kExitCheckFailed : kExitDone;
 }
@@ -57,8 +62,7 @@ ExitStatus runReplay(const ReplayOptions &options, Environment &environment) {
         return runExpect(options, environment, *logs);
     const auto printer = makePrinter(options, environment);
     for (const std::string &file : options.files)
-        play(*openReplay(file, options, environment, *logs), inputTitle(file), options, environment,
-             *printer);
+        play(file, options, environment, *logs, *printer);
     printer->finish();
     return kExitDone;
 }

@@ -41,9 +41,12 @@ ExitStatus runSynth(const SynthOptions &options, Environment &environment) {
         environment.output.write(text);
         return kExitDone;
     }
-    const FrameList frames =
-        Synth::synthesize(*options.scenario, options.parameters, options.seed, options.duration);
-    writeDocument(options.out, writeRecordingContainer(frames), environment);
+    Progress progress(environment, std::string(options.scenario->name));
+    progress.begin("generating", static_cast<std::uint64_t>(Synth::microseconds(options.duration)));
+    const FrameList frames = Synth::synthesize(
+        *options.scenario, options.parameters, options.seed, options.duration,
+        [&progress](Synth::Microseconds made) { progress.update(static_cast<std::uint64_t>(made)); });
+    writeRecording(options.out, frames, environment, progress);
     return kExitDone;
 }
 

@@ -5,9 +5,10 @@
 namespace ZorvaTouch::Tools {
 
 ExitStatus runTrim(const TrimOptions &options, Environment &environment) {
-    FrameList frames = readRecording(options.in, environment).frames;
+    Progress progress(environment, inputTitle(options.in));
+    FrameList frames = readRecording(options.in, environment, progress).frames;
     frames.trim(options.max);
-    writeDocument(options.out, writeRecordingContainer(frames), environment);
+    writeRecording(options.out, frames, environment, progress);
     return kExitDone;
 }
 

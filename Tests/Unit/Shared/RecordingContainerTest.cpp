@@ -355,6 +355,48 @@ TEST(RecordingContainer, EqualKeysOfTheContainerLastOneHolds) {
     EXPECT_EQ(framesOf(older.frames), (std::vector<Frame>{reportFrame(4, {3})}));
 }
 
+TEST(RecordingContainer, AnyVersionMayStandBehindItsFrames) {
+    const std::string both = R"([{"Type":"State","Timestamp":1,"Key":"k","Value":5},)"
+                             R"({"Type":"InputReport","Timestamp":2,"Data":"02","Report":"03"}])";
+    const auto lastVersion = [&both](const char *version) {
+        return readRecordingContainer(
+            R"({"Reports":[{"Timestamp":4,"ReportData":"04"}],"Version":2,"Frames":)" + both +
+            R"(,"Version":)" + version + "}");
+    };
+    EXPECT_EQ(framesOf(lastVersion("2").frames),
+              (std::vector<Frame>{stateFrame(1, "k", 5u), reportFrame(2, {2})}));
+    EXPECT_EQ(framesOf(lastVersion("1").frames),
+              (std::vector<Frame>{stateFrame(1, "k", 5u), reportFrame(2, {3})}));
+    EXPECT_EQ(framesOf(lastVersion("0").frames), (std::vector<Frame>{reportFrame(4, {4})}));
+    EXPECT_EQ(refusal(R"({"Frames":)" + both + R"(,"Version":3})"),
+              migrationRefusal("invalid container version: 3"));
+}
+
+TEST(RecordingContainer, ReadsTextThatArrivesByteByByte) {
+    const std::string text = container("2", R"({"Type":"InputReport","Timestamp":2,"Data":"02 ff "},)"
+                                            R"({"Type":"Metadata","Timestamp":3,"Key":"k","Value":"]}\""})");
+    const RecordingContainer recording = readRecordingContainer(
+        [pieces = Util::piecesOf(text)](char *to, std::size_t) mutable { return pieces(to, 1); });
+    EXPECT_EQ(framesOf(recording.frames),
+              (std::vector<Frame>{reportFrame(2, {2, 255}), metadataFrame(3, "k", "]}\"")}));
+}
+
+TEST(RecordingContainer, TextMustBeJsonBeforeAFrameCanBeWrong) {
+    EXPECT_EQ(refusal(R"({"Version":2,"Frames":[{"Type":"bad"},{]}]})"),
+              migrationRefusal("invalid container"));
+    EXPECT_EQ(refusal(R"({"Version":2,"Frames":[{"Type":"bad"}]},)"), migrationRefusal("invalid container"));
+    EXPECT_EQ(refusal(R"({"Version":1,"Frames":[{}],"x":01})"), migrationRefusal("invalid container"));
+    EXPECT_EQ(refusal(R"({"Frames":[{"Type":"bad"}],"Version":3})"),
+              migrationRefusal("invalid container version: 3"));
+}
+
+TEST(RecordingContainer, AllFramesAreMigratedBeforeOneIsRead) {
+    EXPECT_EQ(refusal(R"({"Version":1,"Frames":[{"Type":"InputReport","Report":5},{"Type":7}]})"),
+              migrationRefusal("frame Type isn't a string"));
+    EXPECT_EQ(refusal(R"({"Version":0,"Reports":[{"Timestamp":"x","ReportData":"1"},{"Timestamp":1}]})"),
+              migrationRefusal("frame lacks ReportData"));
+}
+
 // --- Texts that are no container -----------------------------------------------------------------
 
 /// A good container but for what stands under a key that nothing reads.
@@ -503,7 +545,9 @@ TEST(RecordingContainer, TellsWhatTheJsonParserFound) {
         FAIL() << "nothing was thrown";
     } catch (const ContainerError &error) {
         EXPECT_EQ(error.what(), kMigrationFailed + "invalid container");
-        EXPECT_FALSE(error.reason.empty());
+        EXPECT_EQ(error.problem, "invalid container");
+        EXPECT_EQ(error.reason, "an object's key must be a string");
+        EXPECT_EQ(error.offset, 1u);
         EXPECT_FALSE(error.frameIndex.has_value());
     }
     try {

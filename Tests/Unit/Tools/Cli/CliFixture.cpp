@@ -58,7 +58,7 @@ CliFixture::Run CliFixture::run(std::initializer_list<std::string> arguments) {
     outputSink.text.clear();
     errorSink.text.clear();
     Environment environment{
-        .readInput = [this] { return input; },
+        .openInput = [this] { return Host::Input{.read = Util::piecesOf(input)}; },
         .output = {outputSink, "standard output"},
         .errorOutput = {errorSink, "standard error"},
         .clock = clock,

@@ -186,7 +186,7 @@ TEST(LiveWatch, EventsThatAreNoGesturesAreNotShown) {
 using LiveTableOnAScreen = CliFixture;
 
 TEST_F(LiveTableOnAScreen, WipesTheElectrodesOffBeforeARowAndInTheEnd) {
-    Environment environment{.readInput = nullptr,
+    Environment environment{.openInput = nullptr,
                             .output = {outputSink, "standard output"},
                             .errorOutput = {errorSink, "standard error"},
                             .clock = clock,

@@ -18,25 +18,45 @@ protected:
 
     StringSink outputSink, errorSink;
     Scripted::FakeClock clock;
-    Environment environment{.readInput = {},
+    Environment environment{.openInput = {},
                             .output = {outputSink, "standard output"},
                             .errorOutput = {errorSink, "standard error"},
                             .clock = clock,
                             .openLogs = {},
                             .usesColour = false,
                             .showsProgress = true};
-    std::optional<Progress> bar{std::in_place, environment, "a.json", 60};
+    std::optional<Progress> bar{std::in_place, environment, "a.json"};
 };
 
 TEST_F(ProgressBar, AppearsAfterASecond) {
+    bar->begin("reading", 60);
     EXPECT_EQ(after(999, 10), "");
-    EXPECT_EQ(after(1, 20), "\r\x1b[Ka.json [##########....................] 33%");
+    EXPECT_EQ(after(1, 20), "\r\x1b[Ka.json: reading [##########....................] 33%");
 }
 
 TEST_F(ProgressBar, IsDrawnTenTimesASecond) {
+    bar->begin("reading", 60);
     static_cast<void>(after(1000, 20));
     EXPECT_EQ(after(99, 30), "");
-    EXPECT_EQ(after(1, 60), "\r\x1b[Ka.json [##############################] 100%");
+    EXPECT_EQ(after(1, 60), "\r\x1b[Ka.json: reading [##############################] 100%");
+}
+
+TEST_F(ProgressBar, CountsTheFirstSecondFromTheFirstPartOn) {
+    bar->begin("reading", 60);
+    EXPECT_EQ(after(600, 60), "");
+    bar->begin("replaying", 8);
+    EXPECT_EQ(after(400, 2), "\r\x1b[Ka.json: replaying [#######.......................] 25%");
+}
+
+TEST_F(ProgressBar, ShowsMegabytesIfTheWholeIsUnknown) {
+    bar->begin("reading", 0);
+    EXPECT_EQ(after(1000, 17'900'000), "\r\x1b[Ka.json: reading 17 MB");
+}
+
+TEST_F(ProgressBar, StopsAtAllOfIt) {
+    bar->begin("reading", 60);
+    EXPECT_EQ(after(1000, 61), "\r\x1b[Ka.json: reading [##############################] 100%")
+        << "the file grew";
 }
 
 TEST_F(ProgressBar, MakesWayForOutput) {

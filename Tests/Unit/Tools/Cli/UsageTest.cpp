@@ -126,30 +126,25 @@ TEST_F(Usage, AFolderIsNoFile) {
     EXPECT_EQ(errorOf({"replay", "@folder"}), "zorvatouch: @folder: cannot read: Is a directory\n");
 }
 
-TEST_F(Usage, TextThatIsNoJsonIsAnError) {
-    writeFile("a.json", "");
-    EXPECT_EQ(
-        errorOf({"replay", "@a.json"}),
-        "zorvatouch: @a.json: migrateSerializedContainer failed: invalid container (the text is empty)\n");
-    input = "[}";
-    EXPECT_THAT(
-        errorOf({"replay", "-"}),
-        StartsWith("zorvatouch: standard input: migrateSerializedContainer failed: invalid container ("));
-}
-
-TEST_F(Usage, JsonThatIsNoContainerIsAnError) {
+TEST_F(Usage, AForeignFileIsNamedAsOneWithReasonAndPlace) {
     const auto problem = [this](const std::string &text) {
         writeFile("a.json", text);
         const std::string line = errorOf({"info", "@a.json"});
         EXPECT_THAT(line, StartsWith("zorvatouch: @a.json: "));
         return line.substr(21, line.size() - 22);
     };
-    EXPECT_EQ(problem("[]"), "migrateSerializedContainer failed: invalid container");
-    EXPECT_EQ(problem(R"({"Frames":[]})"), "migrateSerializedContainer failed: invalid version");
-    EXPECT_EQ(problem(R"({"Version":3})"), "migrateSerializedContainer failed: invalid container version: 3");
-    EXPECT_EQ(problem(R"({"Version":2})"), "invalid frames");
-    EXPECT_EQ(problem(R"({"Version":0,"Reports":[{"Timestamp":1}]})"),
-              "frame 0: migrateSerializedContainer failed: frame lacks ReportData");
+    EXPECT_EQ(problem(""), "not a ZorvaTouch recording (the text is empty, byte 0)");
+    EXPECT_EQ(problem("hello"), "not a ZorvaTouch recording (not JSON, byte 0)");
+    EXPECT_EQ(problem(R"({"Version":2,"Frames":[)"),
+              "not a ZorvaTouch recording (the text ends early, byte 23)");
+    EXPECT_EQ(problem("[]"), "not a ZorvaTouch recording (invalid container)");
+    EXPECT_EQ(problem(R"({"Frames":[]})"), "not a ZorvaTouch recording (invalid version)");
+    EXPECT_EQ(problem(R"({"Version":3})"), "not a ZorvaTouch recording (invalid container version: 3)");
+    EXPECT_EQ(problem(R"({"Version":2})"), "not a ZorvaTouch recording (invalid frames)");
+    EXPECT_EQ(problem(R"({"Version":0,"Reports":[{"Timestamp":1}]})"), "frame 0: frame lacks ReportData");
+    input = "[}";
+    EXPECT_EQ(errorOf({"replay", "-"}),
+              "zorvatouch: standard input: not a ZorvaTouch recording (not JSON, byte 0)\n");
 }
 
 TEST_F(Usage, AFrameThatIsWrongIsNamed) {
