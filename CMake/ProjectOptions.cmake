@@ -39,6 +39,8 @@ if(zorva_sanitizers)
     endif()
 endif()
 if(ZORVA_FUZZ)
-    add_compile_options(-fsanitize=fuzzer-no-link)
-    add_link_options(-fsanitize=fuzzer-no-link)
+    add_compile_options(-fsanitize=fuzzer-no-link
+        -fsanitize-coverage-ignorelist=${CMAKE_SOURCE_DIR}/Fuzz/coverage-ignore.txt
+        -fprofile-instr-generate=/dev/null -fcoverage-mapping) # LLVM_PROFILE_FILE names another file
+    add_link_options(-fsanitize=fuzzer-no-link -fprofile-instr-generate)
 endif()

@@ -4,6 +4,10 @@
 #include <algorithm>
 #include <string_view>
 
+// Targets: Shared/FrameList.cpp Shared/RecordingContainer.cpp Shared/Util/Hex.cpp Shared/Util/Json.cpp
+//
+// Length: 2048
+//
 // The container reader: no text crashes it, and what it reads is written and read back the same.
 
 using namespace ZorvaTouch;

@@ -6,6 +6,10 @@
 #include <string>
 #include <string_view>
 
+// Targets: Shared/Util/Hex.cpp
+//
+// Length: 256
+//
 // Hex text: any text reads without a crash, a blank in front changes nothing, and what was read is written
 // and read back the same.
 

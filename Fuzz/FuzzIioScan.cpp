@@ -5,6 +5,10 @@
 #include <fuzzer/FuzzedDataProvider.h>
 #include <string>
 
+// Targets: Host/Linux/IioScan.cpp Host/Linux/IioText.cpp
+//
+// Length: 384
+//
 // Texts and scans of a sensor: any text is read or refused, what was read is possible, and whatever lies in a
 // scan of any layout is three finite numbers.
 

@@ -7,6 +7,10 @@
 #include <fuzzer/FuzzedDataProvider.h>
 #include <string>
 
+// Targets: Tools/Daemon/HeldKeys.cpp Tools/Daemon/KeyMap.cpp Tools/Daemon/KeyMapper.cpp
+//
+// Length: 256
+//
 // The road from events to keys: no text crashes the map, and whatever two surfaces say, a touch acts at most
 // once and the keyboard has a release for each press and a press for each release.
 

@@ -5,6 +5,10 @@
 #include <cstddef>
 #include <cstdint>
 
+// Targets: Plugin/ValueObject.cpp Shared/Util/PropertyValue.cpp
+//
+// Length: 256
+//
 // A value of the boundary whose maker answers whatever comes to mind: kinds that change, counts without end,
 // parts that are missing, or itself again. Only the lengths of its texts are true. Reading it ends, and what
 // was read crosses the boundary once more unchanged.

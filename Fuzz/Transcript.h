@@ -9,11 +9,11 @@
 #include <cstdio>
 #include <cstdlib>
 #include <memory>
-#include <string>
+#include <vector>
 
 namespace ZorvaTouch::Fuzzing {
 
-/// Ends the process if two roads that must agree do not.
+/// Ends the process if a claim does not hold.
 #define ZORVA_MUST(condition)                                                                                \
     do {                                                                                                     \
         if (!(condition)) {                                                                                  \
@@ -22,15 +22,23 @@ namespace ZorvaTouch::Fuzzing {
         }                                                                                                    \
     } while (false)
 
+/// Host ticks (nanoseconds) at which every live recording and every replay of a target begins, so that both
+/// have the same time stamps.
+inline constexpr std::uint64_t kStartTicks = 1'000'000'000;
+
 /// A clock that stands still and never sleeps.
 class StillClock final : public Ports::Clock {
 public:
-    std::uint64_t nowTicks() noexcept override { return 1'000'000'000; }
+    std::uint64_t nowTicks() noexcept override { return kStartTicks; }
     Ports::TimeBase timeBase() noexcept override { return {1, 1}; }
     void sleepMicroseconds(std::uint64_t) noexcept override {}
 };
 
-/// A pipeline that writes down its events and, after each image, both descriptions.
+/// State or events as numbers. A float is there by its bits, so that a NaN equals itself; no text is made,
+/// because formatting takes longer than recognizing.
+using Words = std::vector<std::uint64_t>;
+
+/// A pipeline that writes down its events.
 class TranscribedPipeline {
 public:
     TranscribedPipeline();
@@ -38,20 +46,20 @@ public:
     TranscribedPipeline &operator=(const TranscribedPipeline &) = delete;
     ~TranscribedPipeline() = default;
 
-    /// Plays the frames into the pipeline, as fast as it goes.
+    /// Plays the frames into the pipeline without waiting.
     void play(const FrameList &frames);
 
     [[nodiscard]] const std::shared_ptr<Pipeline> &pipeline() const { return _pipeline; }
-    /// Everything so far, with the counters and the tunables at the end.
-    [[nodiscard]] std::string text() const;
-    [[nodiscard]] std::string tunables() const;
+    /// Events so far with their time stamps, the recognizer's whole state, counters and tunables.
+    [[nodiscard]] Words transcript() const;
+    [[nodiscard]] Words tunables() const;
 
 private:
     std::shared_ptr<Pipeline> _pipeline;
-    std::string _events;
+    Words _events;
 };
 
-/// Demands what holds for every recording: replaying twice gives the same text, and a trimmed recording ends
+/// Demands what holds for every recording: two replays have the same transcript, and a trimmed recording ends
 /// in the same tunables.
 void demandReplayAgrees(const FrameList &frames);
 

@@ -254,6 +254,8 @@ void parseDirective(std::string_view line, StimulusTimeline &timeline) {
 /// Sorts lines into stimulus and expected ones.
 class TextReader {
 public:
+    explicit TextReader(std::size_t maxFrames) noexcept : _timeline(maxFrames) {}
+
     void readLine(std::string_view line) {
         ++_lineNumber;
         const std::string_view content = withoutOuterBlanks(line);
@@ -287,8 +289,8 @@ private:
 
 } // namespace
 
-Stimulus parseStimulus(std::string_view text) {
-    TextReader reader;
+Stimulus parseStimulus(std::string_view text, std::size_t maxFrames) {
+    TextReader reader(maxFrames);
     while (!text.empty()) {
         const std::size_t end = std::min(text.find('\n'), text.size());
         reader.readLine(text.substr(0, end));

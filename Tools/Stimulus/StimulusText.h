@@ -38,7 +38,8 @@ struct Stimulus {
 };
 
 /// Parses a text: stimulus lines, a blank line, expected lines.
+/// @param maxFrames  Most frames that the text may make; `kStimulusMaxFrames` or less.
 /// @throws StimulusError  for the first line that cannot be read.
-[[nodiscard]] Stimulus parseStimulus(std::string_view text);
+[[nodiscard]] Stimulus parseStimulus(std::string_view text, std::size_t maxFrames = kStimulusMaxFrames);
 
 } // namespace ZorvaTouch::Tools

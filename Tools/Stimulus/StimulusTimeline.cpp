@@ -51,8 +51,8 @@ void StimulusTimeline::addKeyed(FrameType type, std::string key, PropertyValue v
 }
 
 void StimulusTimeline::requireRoom(std::size_t frameCount) const {
-    if (frameCount > kStimulusMaxFrames - _frames.size())
-        throw LineProblem("the recording gets more than " + std::to_string(kStimulusMaxFrames) + " frames");
+    if (frameCount > _maxFrames - _frames.size())
+        throw LineProblem("the recording gets more than " + std::to_string(_maxFrames) + " frames");
 }
 
 void StimulusTimeline::requireTime(std::uint64_t durationMs) const {

@@ -29,6 +29,9 @@ using Ramps = std::array<Ramp, kElectrodeCount>;
 /// Every operation that would exceed the limits of a text throws `LineProblem` and changes nothing.
 class StimulusTimeline {
 public:
+    /// @param maxFrames  Most frames of the recording.
+    explicit StimulusTimeline(std::size_t maxFrames) noexcept : _maxFrames(maxFrames) {}
+
     [[nodiscard]] std::int64_t periodMs() const noexcept { return static_cast<std::int64_t>(_periodMs); }
     void setPeriodMs(std::uint32_t periodMs) noexcept { _periodMs = periodMs; }
     void setSensorClock(std::uint32_t timeMs) noexcept { _sensorTimeMs = timeMs; }
@@ -55,6 +58,7 @@ private:
     void advance(std::uint64_t durationMs) noexcept;
     [[nodiscard]] std::uint64_t timestampNs() const noexcept;
 
+    std::size_t _maxFrames;
     FrameList _frames;
     std::uint64_t _elapsedMs = 0;    ///< host's clock; does not jump with the sensor's
     std::uint32_t _periodMs = 10;    ///< between two reports

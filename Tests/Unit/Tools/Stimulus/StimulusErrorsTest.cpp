@@ -128,6 +128,16 @@ TEST(StimulusErrors, OfSize) {
     });
 }
 
+TEST(StimulusErrors, OfASizeThatTheCallerLimits) {
+    EXPECT_EQ(parseStimulus("idle for 3 reports", 3).frames.size(), 3u);
+    try {
+        static_cast<void>(parseStimulus("idle for 3 reports\nidle", 3));
+        FAIL() << "four frames were made";
+    } catch (const StimulusError &error) {
+        EXPECT_STREQ(error.what(), "line 2: the recording gets more than 3 frames");
+    }
+}
+
 TEST(StimulusErrors, OfLength) {
     // 10^13 ms are 2328 of the longest waits and 1316137240 ms more.
     std::string text;
