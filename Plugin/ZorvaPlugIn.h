@@ -201,8 +201,8 @@ typedef struct ZorvaRunLoopTable {
      * or the function is null. [any] */
     uint64_t (*addSource)(ZorvaRunLoop *loop, const char *mode, ZorvaFunction perform, void *context);
     /* The same for a descriptor: `perform` is called while it is readable, has failed or was hung up. The
-     * descriptor stays its owner's, who removes the source before closing it. 0 also for one that cannot be
-     * watched. [any] */
+     * descriptor stays its owner's, who removes the source before closing it. 0 also for one that is not open
+     * or cannot be polled: a regular file, a folder. [any] */
     uint64_t (*addDescriptor)(ZorvaRunLoop *loop, const char *mode, int descriptor, ZorvaFunction perform,
                               void *context);
     /* Makes a source ready. An unknown number is ignored. Does not block, takes no memory. [any] */

@@ -6,7 +6,6 @@
 #include <asio/error.hpp>
 
 #include <algorithm>
-#include <system_error>
 #include <utility>
 
 namespace ZorvaTouch::Host {
@@ -136,8 +135,6 @@ void AsioRunLoop::waitEnded(Source &source, const asio::error_code &error) {
 // --- Sources, under the lock -----------------------------------------------------------------------
 
 void AsioRunLoop::wait(const std::shared_ptr<Source> &source) {
-    if (source->isAlwaysReadable)
-        makeReady(*source);
     if (!source->watch || source->isWaiting)
         return;
     source->isWaiting = true;
@@ -208,13 +205,7 @@ std::uint64_t AsioRunLoop::add(const std::shared_ptr<Source> &source) {
 }
 
 std::uint64_t AsioRunLoop::addDescriptor(const std::shared_ptr<Source> &source, int descriptor) {
-    try {
-        source->watch.emplace(_io, descriptor);
-    } catch (const std::system_error &failure) {
-        if (failure.code() != std::errc::operation_not_permitted)
-            throw;
-        source->isAlwaysReadable = true;
-    }
+    source->watch.emplace(_io, descriptor);
     return add(source);
 }
 

@@ -28,8 +28,9 @@ namespace ZorvaTouch::Host {
 /// A source is either signalled or has a descriptor. It becomes ready and stays so until it is served, also
 /// while another mode runs; of several the one that has waited longest comes first. A descriptor is served
 /// as long as it is readable, has failed or was hung up: whoever finds an end or an error there removes the
-/// source. One that cannot be waited for (a regular file) is always readable. Readiness that other code may
-/// have used up in the meantime is asked for again, so that `perform` can read without blocking.
+/// source. One that cannot be polled (a regular file) is refused: it is always readable, so its `perform`
+/// would run without a pause. Readiness that other code may have used up in the meantime is asked for again,
+/// so that `perform` can read without blocking.
 ///
 /// Closures in turn: those that are there when a pass looks for them, in order, before the next source. So
 /// closures that make closures, and sources that are always ready, leave room for each other.
@@ -65,7 +66,7 @@ private:
     explicit AsioRunLoop(std::shared_ptr<Ports::Log> log);
 
     std::uint64_t add(const std::shared_ptr<Source> &source);
-    /// @throws std::system_error  The descriptor cannot be watched and is not always readable either.
+    /// @throws std::system_error  The descriptor cannot be watched.
     std::uint64_t addDescriptor(const std::shared_ptr<Source> &source, int descriptor);
     void signal(std::uint64_t number) noexcept;
     void remove(std::uint64_t number) noexcept;

@@ -18,8 +18,10 @@ namespace ZorvaTouch::Host {
 /// Threads: one at a time. The waits' handlers are called by whoever runs the context.
 class [[gnu::visibility("hidden")]] DescriptorWatch {
 public:
-    /// @throws std::system_error  EPERM: the descriptor is always readable, as a regular file is, and not to
-    ///                            be waited for. Any other: it is none, or the system has none left.
+    /// @throws std::system_error  EPERM: the descriptor cannot be polled (a regular file, a folder,
+    /// /dev/null).
+    ///                            EBADF: it is not open. Any other: the system has no descriptor or memory
+    ///                            left.
     DescriptorWatch(asio::io_context & context, int descriptor);
     /// Calls off a wait: its handler hears of it when the context runs, or is destroyed with the context.
     ~DescriptorWatch();

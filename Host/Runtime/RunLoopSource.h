@@ -21,11 +21,10 @@ struct AsioRunLoop::Source {
     void *const context;
 
     std::uint64_t number = 0;
-    std::optional<DescriptorWatch> watch; ///< none: signalled only, or always readable
+    std::optional<DescriptorWatch> watch; ///< none: signalled only
     HandlerMemory memory;
     std::uint64_t waitingSince = 0; ///< the loop's moment when the last wait began
     std::uint64_t readySince = 0;   ///< 0: not ready
-    bool isAlwaysReadable = false;
     bool isSignalled = false;
     bool isWaiting = false; ///< for the descriptor
     bool isRemoved = false;

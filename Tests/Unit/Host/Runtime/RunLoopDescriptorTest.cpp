@@ -1,5 +1,6 @@
 #include "Host/Interface/RunLoop.h"
 
+#include "Host/Linux/UniqueFd.h"
 #include "Tests/Unit/Host/Runtime/RunLoopFixture.h"
 
 #include <algorithm>
@@ -200,18 +201,19 @@ TEST_P(RunLoopDescriptors, ThatHaveFailedAreServedUntilTheyAreRemoved) {
     EXPECT_EQ(served, "pp");
 }
 
-TEST_P(RunLoopDescriptors, OfRegularFilesAreAlwaysReadable) {
+TEST_P(RunLoopDescriptors, ThatCannotBePolledAreRefusedWithALine) {
     const RuntimeTests::LogText file;
-    const auto f = addDescriptor('f', ::fileno(file.file()));
-    passes(2);
-    const auto s = addSource('s');
-    signal(s);
-    passes(2);
-    EXPECT_EQ(served, "fffs");
-    remove(f);
-    signal(s);
-    passes(1);
-    EXPECT_EQ(served, "fffss");
+    const Linux::UniqueFd folder(::open("/", O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+    const Linux::UniqueFd null(::open("/dev/null", O_RDONLY | O_CLOEXEC));
+    std::string lines;
+    for (const int descriptor : {::fileno(file.file()), folder.get(), null.get()}) {
+        EXPECT_EQ(addDescriptor('f', descriptor), 0u);
+        lines += "error subsystem=org.zorva.hid.ZorvaTouch category=RunLoop refused: watch descriptor " +
+                 std::to_string(descriptor) + ": Operation not permitted\n";
+    }
+    EXPECT_EQ(log.text(), lines);
+    EXPECT_EQ(pass(), RunOutcome::Finished);
+    EXPECT_EQ(served, "");
 }
 
 TEST_P(RunLoopDescriptors, ThatAreNoneAreRefusedWithALine) {
