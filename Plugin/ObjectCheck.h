@@ -2,15 +2,28 @@
 
 #include "Plugin/ZorvaPlugIn.h"
 
+#include <cstddef>
+
 /// Whether an object of the host can be used at all: it is there, and its table has every entry that is
-/// called. A host that left one out is told so at once instead of crashing the input thread later.
+/// called. The check at the start replaces a crash of the input thread later.
+///
+/// A table may be smaller than the one of this header if only optional entries are missing at its end.
 ///
 /// Threads: any; nothing is called.
 namespace ZorvaTouch {
 
+/// An entry of a table; null if the table is too small to have it. Nothing beyond `table.size` is read.
+template <typename Table, typename Entry>
+[[nodiscard]] Entry entryOf(const Table &table, Entry Table::*entry) noexcept {
+    static constexpr Table kLayout{};
+    const auto *const begin = static_cast<const std::byte *>(static_cast<const void *>(&kLayout));
+    const auto *const end = static_cast<const std::byte *>(static_cast<const void *>(&(kLayout.*entry) + 1));
+    return table.size >= static_cast<std::size_t>(end - begin) ? table.*entry : nullptr;
+}
+
 template <typename Table, typename... Entries>
 [[nodiscard]] bool hasEntries(const Table *table, Entries Table::*...entries) noexcept {
-    return table && table->size >= sizeof(Table) && ((table->*entries != nullptr) && ...);
+    return table && ((entryOf(*table, entries) != nullptr) && ...);
 }
 
 [[nodiscard]] inline bool isComplete(const ZorvaValue *value) noexcept {
@@ -47,7 +60,7 @@ template <typename Table, typename... Entries>
                                 &Table::schedule, &Table::unschedule);
 }
 
-/// `createEventClient` and `setProperty` may be missing.
+/// `createEventClient` and `setProperty` are optional: ask for them with `entryOf`.
 [[nodiscard]] inline bool isComplete(const ZorvaService *service) noexcept {
     using Table = ZorvaServiceTable;
     return service && hasEntries(service->table, &Table::retain, &Table::release, &Table::createDevice);

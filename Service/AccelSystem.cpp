@@ -34,9 +34,10 @@ AccelSystem::AccelSystem(const Ref<ZorvaService> &eventSystem, const ServiceLog 
 }
 
 void AccelSystem::createClient(const Ref<ZorvaService> &eventSystem) {
-    if (eventSystem && eventSystem->table->createEventClient) {
-        ZorvaEventClient *const client =
-            eventSystem->table->createEventClient(eventSystem.get(), ZORVA_EVENT_CLIENT_MONITOR);
+    const auto create =
+        eventSystem ? entryOf(*eventSystem->table, &ZorvaServiceTable::createEventClient) : nullptr;
+    if (create) {
+        ZorvaEventClient *const client = create(eventSystem.get(), ZORVA_EVENT_CLIENT_MONITOR);
         if (isComplete(client))
             _client = Ref<ZorvaEventClient>::adopt(client);
     }
@@ -59,10 +60,11 @@ void AccelSystem::takeFirstService() {
 }
 
 void AccelSystem::setReportInterval(std::uint32_t rateHz) {
-    if (!_service->table->setProperty)
+    const auto setProperty = entryOf(*_service->table, &ZorvaServiceTable::setProperty);
+    if (!setProperty)
         return;
     const auto interval = makeValue(1.0 / rateHz * kMicrosecondsPerSecond);
-    _service->table->setProperty(_service.get(), "ReportInterval", interval.get());
+    setProperty(_service.get(), "ReportInterval", interval.get());
 }
 
 void AccelSystem::handleEvent(void *context, const ZorvaEvent *event) noexcept {
