@@ -14,23 +14,47 @@ namespace {
 
 using Children = std::vector<Ref<const ZorvaValue>>;
 
+/// Holds a value to the limits of the boundary, in either direction.
+class PartCount {
+public:
+    /// Counts a part at that depth, 0 for the value itself.
+    /// @throws std::length_error  It is beyond a limit.
+    void add(std::size_t depth) {
+        if (depth >= ZORVA_VALUE_MAX_LEVELS)
+            throw std::length_error("a value has more than 64 levels");
+        if (_parts == ZORVA_VALUE_MAX_PARTS)
+            throw std::length_error("a value has more than 1000000 parts");
+        ++_parts;
+    }
+
+private:
+    std::size_t _parts = 0;
+};
+
 /// One of our values as the other side sees it. The parts of an array or a dictionary are objects of their
 /// own, made with it, since the other side borrows and may keep them.
 class ValueObject final : public BoundaryObject<ValueObject, ZorvaValue> {
 public:
-    explicit ValueObject(const PropertyValue &value) : BoundaryObject(&kTable), _value(value) {
-        if (const PropertyValue::Array *const array = value.asArray())
-            for (const PropertyValue &element : *array)
-                _children.push_back(makeValue(element));
-        if (const PropertyValue::Dictionary *const dictionary = value.asDictionary())
-            for (const auto &[key, element] : *dictionary) {
-                _keys.push_back(key);
-                _children.push_back(makeValue(element));
-            }
+    /// @param depth  0 for the value itself, one more for each level below it.
+    static Ref<const ZorvaValue> make(const PropertyValue &value, PartCount &parts, std::size_t depth = 0) {
+        parts.add(depth);
+        return Ref<const ZorvaValue>::adopt(new ValueObject(value, parts, depth));
     }
 
 private:
     static const ZorvaValueTable kTable;
+
+    ValueObject(const PropertyValue &value, PartCount &parts, std::size_t depth)
+        : BoundaryObject(&kTable), _value(value) {
+        if (const PropertyValue::Array *const array = _value.asArray())
+            for (const PropertyValue &element : *array)
+                _children.push_back(make(element, parts, depth + 1));
+        if (const PropertyValue::Dictionary *const dictionary = _value.asDictionary())
+            for (const auto &[key, element] : *dictionary) {
+                _keys.push_back(key);
+                _children.push_back(make(element, parts, depth + 1));
+            }
+    }
 
     static std::uint32_t kind(const ZorvaValue *value) noexcept {
         return static_cast<std::uint32_t>(of(value)._value.kind());
@@ -88,23 +112,12 @@ const ZorvaValueTable ValueObject::kTable{
     .key = ValueObject::key,
 };
 
-/// Reads one value of the other side. Everything it counts, it was told by somebody it need not trust.
+/// Reads one value of the other side, which may answer anything: counts without end, itself as a part.
 class Reader {
 public:
-    [[nodiscard]] PropertyValue read(const ZorvaValue *value) {
-        PropertyValue result = readPart(value, 0);
-        return _budget == 0 ? PropertyValue() : result;
-    }
-
-private:
-    static constexpr std::size_t kMaxDepth = 64; ///< as the recording's reader
-    static constexpr std::size_t kMaxParts = 1'000'000;
-
-    PropertyValue readPart(const ZorvaValue *value, std::size_t depth) {
-        if (_budget == 0)
-            return {};
-        --_budget; // also for a part that is missing or too deep: there may be no end of those
-        if (!isComplete(value) || depth == kMaxDepth)
+    [[nodiscard]] PropertyValue readPart(const ZorvaValue *value, std::size_t depth = 0) {
+        _parts.add(depth); // also for a part that is missing: a table may claim any number of those
+        if (!isComplete(value))
             return {};
         const ZorvaValueTable &table = *value->table;
         switch (table.kind(value)) {
@@ -127,6 +140,7 @@ private:
         }
     }
 
+private:
     /// No text or block of bytes in memory is as long as some tables claim.
     static std::size_t checkedLength(std::size_t length) {
         if (length > PTRDIFF_MAX)
@@ -149,7 +163,7 @@ private:
     PropertyValue readArray(const ZorvaValue *value, std::size_t depth) {
         PropertyValue::Array array;
         const std::size_t count = value->table->count(value);
-        for (std::size_t index = 0; index < count && _budget > 0; ++index)
+        for (std::size_t index = 0; index < count; ++index)
             array.push_back(readPart(value->table->element(value, index), depth + 1));
         return array;
     }
@@ -157,27 +171,28 @@ private:
     PropertyValue readDictionary(const ZorvaValue *value, std::size_t depth) {
         PropertyValue::Dictionary dictionary;
         const std::size_t count = value->table->count(value);
-        for (std::size_t index = 0; index < count && _budget > 0; ++index) {
+        for (std::size_t index = 0; index < count; ++index) {
             std::size_t length = 0;
             const char *const key = value->table->key(value, index, &length);
             if (key)
                 dictionary.insert_or_assign(std::string(key, checkedLength(length)),
                                             readPart(value->table->element(value, index), depth + 1));
             else
-                --_budget; // or a table with no keys and no end would hold us for ever
+                _parts.add(depth + 1); // a table without keys may claim any number of entries
         }
         return dictionary;
     }
 
-    std::size_t _budget = kMaxParts;
+    PartCount _parts;
 };
 
 } // namespace
 
 Ref<const ZorvaValue> makeValue(const PropertyValue &value) {
-    return Ref<const ZorvaValue>::adopt(new ValueObject(value));
+    PartCount parts;
+    return ValueObject::make(value, parts);
 }
 
-PropertyValue readValue(const ZorvaValue *value) { return Reader().read(value); }
+PropertyValue readValue(const ZorvaValue *value) { return Reader().readPart(value); }
 
 } // namespace ZorvaTouch

@@ -74,7 +74,14 @@ enum {
     kZorvaValueDictionary = 7 /* from string to value */
 };
 
-/* A dynamically typed value. Immutable: it may be read on several threads. [any] */
+/* What a value may have, whoever made it: levels, a value without parts having one; and parts, the value
+ * itself, elements and entries at every level, missing ones among them. A property whose value has more is
+ * refused as a whole: a write returns 0 and a read null, with one line in the log. */
+#define ZORVA_VALUE_MAX_LEVELS 64u
+#define ZORVA_VALUE_MAX_PARTS 1000000u
+
+/* A dynamically typed value. Immutable: it may be read on several threads. Wherever a value is passed,
+ * returned or contained, a null pointer means the same as a value of kind null. [any] */
 typedef struct ZorvaValue ZorvaValue;
 typedef struct ZorvaValueTable {
     size_t size;
@@ -91,9 +98,11 @@ typedef struct ZorvaValueTable {
     const uint8_t *(*bytesValue)(const ZorvaValue *value, size_t *length);
     /* Elements of an array, entries of a dictionary. */
     size_t (*count)(const ZorvaValue *value);
-    /* The element, or the entry's value, below `count`; else null. Borrowed. */
+    /* The element, or the entry's value, below `count`; else null. Borrowed. A null pointer below `count` is
+     * an element of kind null. */
     const ZorvaValue *(*element)(const ZorvaValue *value, size_t index);
-    /* The entry's key, below `count`; else null. Stores the length in bytes. */
+    /* The entry's key, below `count`; else null. Stores the length in bytes. An entry below `count` without a
+     * key is left out. */
     const char *(*key)(const ZorvaValue *value, size_t index, size_t *length);
 } ZorvaValueTable;
 struct ZorvaValue {

@@ -4,6 +4,21 @@
 
 namespace ZorvaTouch::Testing {
 
+const ZorvaValueTable EndlessValue::kTable{
+    .size = sizeof(ZorvaValueTable),
+    .retain = [](const ZorvaValue *) {},
+    .release = [](const ZorvaValue *) {},
+    .kind = [](const ZorvaValue *) { return std::uint32_t{kZorvaValueArray}; },
+    .booleanValue = [](const ZorvaValue *) { return ZorvaBoolean{0}; },
+    .unsignedValue = [](const ZorvaValue *) { return std::uint64_t{0}; },
+    .doubleValue = [](const ZorvaValue *) { return 0.0; },
+    .stringValue = [](const ZorvaValue *, std::size_t *) -> const char * { return nullptr; },
+    .bytesValue = [](const ZorvaValue *, std::size_t *) -> const std::uint8_t * { return nullptr; },
+    .count = [](const ZorvaValue *) { return std::size_t{1}; },
+    .element = [](const ZorvaValue *value, std::size_t) { return value; },
+    .key = [](const ZorvaValue *, std::size_t, std::size_t *) -> const char * { return nullptr; },
+};
+
 // --- The queue -----------------------------------------------------------------------------------
 
 const ZorvaQueueTable ManualQueue::kTable{

@@ -38,6 +38,17 @@ private:
     std::atomic<std::uint32_t> _references = 1;
 };
 
+/// A value that nobody can read to its end: an array whose one element is itself. Not counted.
+///
+/// Threads: any.
+class EndlessValue final : public ZorvaValue {
+public:
+    EndlessValue() : ZorvaValue{&kTable} {}
+
+private:
+    static const ZorvaValueTable kTable;
+};
+
 /// A serial queue that runs nothing until it is told to, on the thread that tells it.
 ///
 /// Threads: any.

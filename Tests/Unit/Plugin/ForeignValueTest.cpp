@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include <cstdint>
+#include <stdexcept>
 #include <string>
 #include <vector>
 
@@ -164,54 +165,76 @@ TEST(ForeignValue, OfEqualKeysTheLastOneHolds) {
     EXPECT_EQ(readValue(&value), PropertyValue(Dictionary{{"k", std::uint32_t{2}}}));
 }
 
-// --- Made to hold us for ever ----------------------------------------------------------------------
+// --- Beyond the limits -----------------------------------------------------------------------------
 
-/// With a count of 2^64-1 and whatever is to be had at each place.
-PropertyValue readEndless(std::uint32_t kind, const char *everyKey, const ZorvaValue *everyElement) {
+/// The message of what reading throws; "" if it does not.
+std::string refusalOf(const ZorvaValue &value) {
+    try {
+        static_cast<void>(readValue(&value));
+        return "";
+    } catch (const std::length_error &error) {
+        return error.what();
+    }
+}
+
+constexpr const char *kTooDeep = "a value has more than 64 levels";
+constexpr const char *kTooLarge = "a value has more than 1000000 parts";
+
+/// Arrays in each other, one element each; the innermost one is empty.
+std::vector<ForeignValue> nestedArrays(std::size_t levels) {
+    std::vector<ForeignValue> arrays(levels, ForeignValue(kZorvaValueArray));
+    for (std::size_t level = 0; level + 1 < levels; ++level) {
+        arrays[level].count = 1;
+        arrays[level].elements = {&arrays[level + 1]};
+    }
+    return arrays;
+}
+
+TEST(ForeignValue, IsReadWithSixtyFourLevelsAndRefusedWithOneMore) {
+    EXPECT_EQ(refusalOf(nestedArrays(64).front()), "");
+    EXPECT_EQ(refusalOf(nestedArrays(65).front()), kTooDeep);
+    auto arrays = nestedArrays(64);
+    arrays.back().count = 1; // of a null pointer, which is a part as well
+    EXPECT_EQ(refusalOf(arrays.front()), kTooDeep);
+}
+
+/// With a count of 2^64-1, unless told otherwise, and the same at each place.
+ForeignValue uniform(std::uint32_t kind, const char *everyKey, const ZorvaValue *everyElement,
+                     std::size_t count = SIZE_MAX) {
     ForeignValue value(kind);
-    value.count = SIZE_MAX;
+    value.count = count;
     value.everyKey = everyKey;
     value.everyElement = everyElement;
-    return readValue(&value);
+    return value;
 }
 
-TEST(EndlessValue, IsNullAsAWhole) {
+TEST(ForeignValue, IsReadWithAMillionPartsAndRefusedWithOneMore) {
     const ForeignValue one = ForeignValue::number(1);
-    EXPECT_TRUE(readEndless(kZorvaValueArray, nullptr, &one).isNull());
-    EXPECT_TRUE(readEndless(kZorvaValueDictionary, "k", &one).isNull());
+    const auto largest = uniform(kZorvaValueArray, nullptr, &one, 999'999); // and the array itself
+    const PropertyValue read = readValue(&largest);
+    ASSERT_TRUE(read.asArray());
+    EXPECT_EQ(read.asArray()->size(), 999'999u);
+    EXPECT_EQ(read.asArray()->back(), PropertyValue(std::uint32_t{1}));
+    EXPECT_EQ(refusalOf(uniform(kZorvaValueArray, nullptr, &one, 1'000'000)), kTooLarge);
 }
 
-TEST(EndlessValue, OfMissingElementsIsNullToo) {
-    EXPECT_TRUE(readEndless(kZorvaValueArray, nullptr, nullptr).isNull());
-    EXPECT_TRUE(readEndless(kZorvaValueDictionary, "k", nullptr).isNull());
-    EXPECT_TRUE(readEndless(kZorvaValueDictionary, nullptr, nullptr).isNull());
+TEST(EndlessValue, IsRefused) {
+    const ForeignValue one = ForeignValue::number(1);
+    EXPECT_EQ(refusalOf(uniform(kZorvaValueArray, nullptr, &one)), kTooLarge);
+    EXPECT_EQ(refusalOf(uniform(kZorvaValueDictionary, "k", &one)), kTooLarge);
 }
 
-TEST(EndlessValue, ThatContainsItselfIsNull) {
-    ForeignValue twice(kZorvaValueArray);
-    twice.elements = {&twice, &twice};
-    twice.count = 2;
-    EXPECT_TRUE(readValue(&twice).isNull());
+TEST(EndlessValue, OfMissingElementsIsRefusedToo) {
+    EXPECT_EQ(refusalOf(uniform(kZorvaValueArray, nullptr, nullptr)), kTooLarge);
+    EXPECT_EQ(refusalOf(uniform(kZorvaValueDictionary, "k", nullptr)), kTooLarge);
+    EXPECT_EQ(refusalOf(uniform(kZorvaValueDictionary, nullptr, nullptr)), kTooLarge);
 }
 
-TEST(EndlessValue, ThatIsEndlessAtTheDeepestLevelIsNull) {
+TEST(EndlessValue, ThatContainsItselfIsRefused) {
     ForeignValue self(kZorvaValueArray);
     self.count = SIZE_MAX;
     self.everyElement = &self;
-    EXPECT_TRUE(readValue(&self).isNull());
-}
-
-TEST(ForeignValue, BelowSixtyFourLevelsIsNull) {
-    ForeignValue self(kZorvaValueArray); // contains itself once: a chain without end
-    self.elements = {&self};
-    self.count = 1;
-    const PropertyValue read = readValue(&self);
-    const PropertyValue *level = &read;
-    int levels = 0;
-    for (; level->asArray(); level = &level->asArray()->front())
-        ++levels;
-    EXPECT_EQ(levels, 64);
-    EXPECT_TRUE(level->isNull());
+    EXPECT_EQ(refusalOf(self), kTooDeep);
 }
 
 } // namespace

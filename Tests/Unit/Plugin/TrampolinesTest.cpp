@@ -248,6 +248,21 @@ struct AbsurdText : ZorvaValue {
     ZorvaValueTable absurdTable;
 };
 
+TEST_F(FailingTrampolines, RefuseAValueBeyondTheLimitsInEitherDirection) {
+    const Testing::EndlessValue endless;
+    EXPECT_EQ((*hid)->setProperty(hid, "key", &endless), 0);
+    EXPECT_TRUE(service.calls.empty());
+    PropertyValue deep;
+    for (int level = 0; level < 64; ++level)
+        deep = PropertyValue::Array{deep};
+    service.answer = *deep.asArray()->begin(); // 64 levels
+    EXPECT_TRUE(Ref<const ZorvaValue>::adopt((*hid)->copyProperty(hid, "key")));
+    service.answer = deep;
+    EXPECT_EQ((*hid)->copyProperty(hid, "key"), nullptr);
+    EXPECT_EQ(takeFailures(), (Calls{"setProperty: a value has more than 64 levels",
+                                     "copyProperty: a value has more than 64 levels"}));
+}
+
 TEST_F(FailingTrampolines, ReportAValueThatCannotBeRead) {
     const AbsurdText absurd;
     EXPECT_EQ((*hid)->setProperty(hid, "key", &absurd), 0);

@@ -5,6 +5,7 @@
 #include <cmath>
 #include <cstdint>
 #include <limits>
+#include <stdexcept>
 #include <string>
 #include <string_view>
 
@@ -121,6 +122,28 @@ TEST(ValueObject, PartsThatAreKeptOutliveTheWhole) {
 }
 
 TEST(ValueObject, SaysTheSizeOfItsTable) { EXPECT_EQ(makeValue({})->table->size, sizeof(ZorvaValueTable)); }
+
+// --- Limits ----------------------------------------------------------------------------------------
+
+/// Arrays in each other; the innermost one is empty.
+PropertyValue nestedArrays(int levels) {
+    PropertyValue value = Array{};
+    for (; levels > 1; --levels)
+        value = Array{value};
+    return value;
+}
+
+TEST(ValueObject, IsMadeWithSixtyFourLevelsAndRefusedWithOneMore) {
+    EXPECT_TRUE(makeValue(nestedArrays(64)));
+    EXPECT_THROW(static_cast<void>(makeValue(nestedArrays(65))), std::length_error);
+}
+
+TEST(ValueObject, IsMadeWithAMillionPartsAndRefusedWithOneMore) {
+    Array parts(999'999); // and the array itself
+    EXPECT_EQ(answersOf(makeValue(parts)).count, 999'999u);
+    parts.emplace_back();
+    EXPECT_THROW(static_cast<void>(makeValue(parts)), std::length_error);
+}
 
 // --- There and back --------------------------------------------------------------------------------
 

@@ -238,6 +238,19 @@ TEST_F(ServiceProperties, OfADeviceThatHandsOverAValueThatIsNotWholeAreNull) {
     EXPECT_TRUE(get("anything").isNull());
 }
 
+TEST_F(ServiceProperties, BeyondTheLimitsOfAValueAreRefusedWithOneLine) {
+    const EndlessValue endless;
+    const auto probe = ProbeDevice::create();
+    const auto offered = ProbeService::create(probe.get());
+    start(offered.get());
+    probe->property = &endless;
+    EXPECT_EQ((*hid)->copyProperty(hid, "anything"), nullptr);
+    EXPECT_EQ((*hid)->setProperty(hid, "Pipeline.Algs.ActivationThreshold", &endless), 0);
+    EXPECT_EQ(platform.journal.errors(), (Lines{"copyProperty failed: a value has more than 64 levels",
+                                                "setProperty failed: a value has more than 64 levels"}));
+    EXPECT_EQ(textOf(get("Recording")), R"({"Version":2,"Frames":[]})");
+}
+
 TEST_F(ServiceProperties, OfADeviceAreReleasedAfterTheyAreRead) {
     const auto probe = ProbeDevice::create();
     const auto offered = ProbeService::create(probe.get());
