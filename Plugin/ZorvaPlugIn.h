@@ -365,8 +365,10 @@ typedef struct HidServiceInterfaceTable {
     /* Who gets the events from the next schedule on. `target` and `refcon` are handed back and not looked
      * at. [host] */
     void (*setEventCallback)(void *self, ZorvaEventCallback callback, void *target, void *refcon);
-    /* Starts the input thread, and returns when it serves its run loop. The queue is retained until it is
-     * unscheduled and everything submitted is delivered. A second schedule unschedules first. [host] */
+    /* Starts the input thread, and returns when the thread has its run loop; the device is scheduled on that
+     * loop, and its first report read, at some time after. The property "ServiceStatus" says whether the
+     * thread could be made, and why not. The queue is retained until it is unscheduled and everything
+     * submitted is delivered. A second schedule unschedules first. [host] */
     void (*scheduleWithDispatchQueue)(void *self, ZorvaQueue *queue);
     /* Ends the input thread, and returns when it is gone: no report is handled any more. Events submitted
      * before are still delivered. `queue` is not compared. Harmless when nothing is scheduled. [host] */

@@ -61,6 +61,7 @@ void ZorvaTouchHIDService::scheduleWithDispatchQueue(ZorvaQueue *queue) {
         startInputReportThread();
     } catch (const std::exception &error) {
         _log.error("Failed to start the input report thread: {}", error.what());
+        setNotScheduled(error.what());
         _inputReportThreadSignal.reset();
         _dispatchEventInfo.queue.reset();
         return;
@@ -83,6 +84,7 @@ void ZorvaTouchHIDService::unscheduleWithDispatchQueue(ZorvaQueue * /*queue*/) {
     if (refuseOnInputReportThread("unscheduleWithDispatchQueue:"))
         return;
     stopInputReportThread();
+    setNotScheduled(kUnscheduled);
     _dispatchEventInfo.queue.reset();
 }
 
@@ -117,25 +119,53 @@ bool ZorvaTouchHIDService::refuseOnInputReportThread(const char *operation) cons
     return true;
 }
 
+// ---- What "ServiceStatus" says
+
+void ZorvaTouchHIDService::setScheduled() noexcept {
+    const Host::MutexLock lock(_pipelineLock);
+    _notScheduledReason.clear();
+}
+
+void ZorvaTouchHIDService::setNotScheduled(std::string_view reason) noexcept {
+    const Host::MutexLock lock(_pipelineLock);
+    try {
+        _notScheduledReason = reason;
+    } catch (const std::bad_alloc &) {
+        _notScheduledReason = "no memory"; // short enough to need none
+    }
+}
+
 // ---- The input-report thread
 
 void ZorvaTouchHIDService::runInputReportThread(const InputReportThreadArguments &arguments) noexcept {
     _log.debug("input report thread start");
     _inputReportThreadId = std::this_thread::get_id();
-    const std::shared_ptr<Host::RunLoop> loop = createInputReportRunLoop();
+    std::shared_ptr<Host::RunLoop> loop;
+    runInputReportStep([&] {
+        loop = _platform.createRunLoop();
+        setScheduled();
+    });
     _inputReportRunLoop = loop;
     arguments.signal->signal();
     if (loop)
-        runGuarded(_log, "input report thread", [&] { handleInputReports(arguments, *loop); });
+        runInputReportStep([&] { handleInputReports(arguments, *loop); });
     _inputReportThreadId = std::thread::id(); // the system gives numbers away again
     arguments.signal->signal();
     _log.debug("input report thread end");
 }
 
-std::shared_ptr<Host::RunLoop> ZorvaTouchHIDService::createInputReportRunLoop() const noexcept {
-    std::shared_ptr<Host::RunLoop> loop;
-    runGuarded(_log, "input report thread", [&] { loop = _platform.createRunLoop(); });
-    return loop;
+template <typename Step> void ZorvaTouchHIDService::runInputReportStep(const Step &step) noexcept {
+    runGuarded(_log, "input report thread", [&] {
+        try {
+            step();
+        } catch (const std::exception &error) {
+            setNotScheduled(error.what());
+            throw;
+        } catch (...) {
+            setNotScheduled("unknown exception");
+            throw;
+        }
+    });
 }
 
 void ZorvaTouchHIDService::handleInputReports(const InputReportThreadArguments &arguments,

@@ -50,12 +50,13 @@ struct ZorvaTouchHIDService::OwnProperty {
     PropertyValue (ZorvaTouchHIDService::*read)();
 };
 
-const std::array<ZorvaTouchHIDService::OwnProperty, 5> ZorvaTouchHIDService::kOwnProperties{{
+const std::array<ZorvaTouchHIDService::OwnProperty, 6> ZorvaTouchHIDService::kOwnProperties{{
     {"Version", &ZorvaTouchHIDService::version},
     {"FirmwareDebugReports", &ZorvaTouchHIDService::firmwareDebugReports},
     {"FactoryResetHoldDuration", &ZorvaTouchHIDService::factoryResetHoldDuration},
     {"Recording", &ZorvaTouchHIDService::recording},
     {"ServicePluginDebug", &ZorvaTouchHIDService::servicePluginDebug},
+    {"ServiceStatus", &ZorvaTouchHIDService::serviceStatus},
 }};
 
 PropertyValue ZorvaTouchHIDService::getPropertyForKey(const char *key) {
@@ -140,6 +141,14 @@ PropertyValue ZorvaTouchHIDService::servicePluginDebug() {
         if (PropertyValue value = getPropertyForKey(key); !value.isNull())
             gathered[key] = std::move(value);
     return gathered;
+}
+
+PropertyValue ZorvaTouchHIDService::serviceStatus() {
+    const Host::MutexLock lock(_pipelineLock);
+    PropertyValue::Dictionary status{{"Scheduled", _notScheduledReason.empty()}};
+    if (!_notScheduledReason.empty())
+        status["Reason"] = _notScheduledReason;
+    return status;
 }
 
 } // namespace ZorvaTouch

@@ -17,6 +17,7 @@
 #include <cstdint>
 #include <memory>
 #include <string>
+#include <string_view>
 #include <thread>
 
 namespace ZorvaTouch {
@@ -26,6 +27,9 @@ inline constexpr std::string_view kLogCategoryService = "HIDService";
 
 /// Mode in which the input-report thread runs its run loop.
 inline constexpr const char *kHandleInputReportsRunLoopMode = "kHandleInputReportsRunLoopMode";
+
+/// Why a service is not scheduled that the host has not scheduled, or has unscheduled.
+inline constexpr std::string_view kUnscheduled = "unscheduled";
 
 /// Domain of the pipeline's state keys among the properties: "Pipeline.Algs.ActivationThreshold".
 inline constexpr std::string_view kPipelineDomain = "Pipeline";
@@ -39,8 +43,8 @@ inline constexpr std::string_view kPipelineDomain = "Pipeline";
 ///   InputReports.cpp           what the thread does with a report and with an accelerometer sample
 ///   ServiceProperties.cpp      properties
 ///
-/// Threads: see `ZorvaPlugIn.h`. `_pipelineLock` is the only lock; nobody holds it while calling out to the
-///          host, or while waiting.
+/// Threads: see `ZorvaPlugIn.h`. `_pipelineLock` is the only lock. It is never held while waiting. Of the
+///          host's functions one is called under it: `submit` of the queue, with the events of a report.
 // NOLINTNEXTLINE(cppcoreguidelines-virtual-class-destructor): the last release alone destroys it
 class ZorvaTouchHIDService final : public ZorvaHIDService {
 public:
@@ -86,7 +90,10 @@ private:
     void signalInputReportThreadToExit(Host::RunLoop &loop) const noexcept;
     [[nodiscard]] bool refuseOnInputReportThread(const char *operation) const noexcept;
     void runInputReportThread(const InputReportThreadArguments &arguments) noexcept;
-    [[nodiscard]] std::shared_ptr<Host::RunLoop> createInputReportRunLoop() const noexcept;
+    /// Runs a part of the thread's work; what it throws becomes an error line and the status.
+    template <typename Step> void runInputReportStep(const Step &step) noexcept;
+    void setScheduled() noexcept ZORVA_EXCLUDES(_pipelineLock);
+    void setNotScheduled(std::string_view reason) noexcept ZORVA_EXCLUDES(_pipelineLock);
     void handleInputReports(const InputReportThreadArguments &arguments, Host::RunLoop &loop);
     void setInputReportThreadPriority() const noexcept;
     [[nodiscard]] std::unique_ptr<AccelSystem> createAccelSystem(const Ref<ZorvaService> &eventSystem,
@@ -109,7 +116,7 @@ private:
 
     // ServiceProperties.cpp
     struct OwnProperty;
-    static const std::array<OwnProperty, 5> kOwnProperties;
+    static const std::array<OwnProperty, 6> kOwnProperties;
     [[nodiscard]] PropertyValue pipelineState(const std::string &key) ZORVA_EXCLUDES(_pipelineLock);
     void setPipelineState(const std::string &key, const PropertyValue &value) ZORVA_EXCLUDES(_pipelineLock);
     [[nodiscard]] PropertyValue version();
@@ -118,6 +125,7 @@ private:
     [[nodiscard]] PropertyValue recording() ZORVA_EXCLUDES(_pipelineLock);
     [[nodiscard]] PipelineRecording copyOfRecording() ZORVA_EXCLUDES(_pipelineLock);
     [[nodiscard]] PropertyValue servicePluginDebug();
+    [[nodiscard]] PropertyValue serviceStatus() ZORVA_EXCLUDES(_pipelineLock);
 
     // Constant.
     Host::Platform &_platform;
@@ -139,6 +147,7 @@ private:
     std::shared_ptr<Pipeline> _pipeline ZORVA_GUARDED_BY(_pipelineLock);
     PipelineRecording _recording ZORVA_GUARDED_BY(_pipelineLock);
     AccelCapture _accel ZORVA_GUARDED_BY(_pipelineLock);
+    std::string _notScheduledReason ZORVA_GUARDED_BY(_pipelineLock){kUnscheduled}; ///< empty: scheduled
 };
 
 } // namespace ZorvaTouch

@@ -56,7 +56,6 @@ Daemon::Daemon(const DaemonOptions &options, DaemonSurroundings surroundings)
                  .keyMap = options.keys,
                  .listener = *_listener,
                  .loop = _loop,
-                 .threadFailures = [this] { return _platform.failures(); },
                  .log = DaemonLog(*_logs, "Surfaces")},
                 _surroundings.finder, _surroundings.clock,
                 {.onComing = [this](const SurfaceName &name) { _recordings.expect(name); },

@@ -55,16 +55,12 @@ void Surface::schedule() {
                                           [observer = _observer] { observer->tellHeld(); });
     _observer->begin(_keys);
     _service->setEventCallback(SurfaceKeys::receive, _keys.get());
-    const unsigned failuresBefore = threadFailures();
-    _service->schedule(_surroundings.keyQueue.boundary());
-    if (threadFailures() == failuresBefore)
-        return;
-    _observer->finish();
-    throw std::runtime_error("the system has no thread, or no descriptors, for its reports");
-}
-
-unsigned Surface::threadFailures() const {
-    return _surroundings.threadFailures ? _surroundings.threadFailures() : 0;
+    try {
+        _service->schedule(_surroundings.keyQueue.boundary());
+    } catch (...) {
+        _observer->finish();
+        throw;
+    }
 }
 
 void Surface::unschedule(SurfaceEnd end) {

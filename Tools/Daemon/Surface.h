@@ -29,9 +29,6 @@ struct SurfaceSurroundings {
     KeyMap keyMap;
     DaemonListener &listener;
     Linux::MainLoop &loop;
-    /// Threads and run loops that the plug-in could not have so far; it has no other way to tell. Empty:
-    /// none.
-    std::function<unsigned()> threadFailures = {};
     DaemonLog log;
     Linux::LoopTimer after = {}; ///< empty: the loop's own
 
@@ -92,7 +89,6 @@ private:
     void schedule();
     void watchSilence();
     void checkSilence();
-    [[nodiscard]] unsigned threadFailures() const;
     void unschedule(SurfaceEnd end);
     void letGo(SurfaceEnd end);
 

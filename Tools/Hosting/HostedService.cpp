@@ -87,9 +87,21 @@ void HostedService::setEventCallback(ZorvaEventCallback callback, void *target) 
     (*_hid)->setEventCallback(_hid, callback, target, nullptr);
 }
 
-void HostedService::schedule(ZorvaQueue *queue) noexcept {
+void HostedService::schedule(ZorvaQueue *queue) {
     _queue = queue;
     (*_hid)->scheduleWithDispatchQueue(_hid, queue);
+    requireScheduled();
+}
+
+/// Takes a service that does not say whether it is scheduled for one that is.
+void HostedService::requireScheduled() {
+    const auto status = property("ServiceStatus");
+    const PropertyValue *const reason = status ? status->find("Reason") : nullptr;
+    const std::string *const text = reason ? reason->asString() : nullptr;
+    if (!text)
+        return;
+    unschedule();
+    fail("the service cannot read reports: " + *text);
 }
 
 void HostedService::unschedule() noexcept {

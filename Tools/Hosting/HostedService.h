@@ -43,7 +43,8 @@ public:
     void start(ZorvaService *offered);
     /// @param target  Handed back with each event.
     void setEventCallback(ZorvaEventCallback callback, void *target) noexcept;
-    void schedule(ZorvaQueue *queue) noexcept;
+    /// @throws HostingError  The service cannot read reports, with the reason; it is not scheduled.
+    void schedule(ZorvaQueue *queue);
     /// Afterwards no report is handled any more; events may still wait in the queue.
     void unschedule() noexcept;
 
@@ -59,6 +60,7 @@ public:
 private:
     [[noreturn]] void fail(const std::string &problem) const;
     void require(ZorvaStatus status, const char *operation) const;
+    void requireScheduled();
 
     const std::shared_ptr<const Host::PlugInFile> _plugIn;
     PlugInInterfaceTable **_plug = nullptr;    ///< one reference

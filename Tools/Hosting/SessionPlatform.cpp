@@ -42,23 +42,13 @@ SessionPlatform::~SessionPlatform() { Host::setProcessPlatform(nullptr); }
 
 std::unique_ptr<Host::Semaphore> SessionPlatform::createSemaphore() { return _system.createSemaphore(); }
 
-/// What throws is a failure to be counted.
-template <typename Make> auto SessionPlatform::counted(const Make &make) {
-    try {
-        return make();
-    } catch (...) {
-        ++_failures;
-        throw;
-    }
-}
-
 std::unique_ptr<Host::Thread> SessionPlatform::startThread(const char *name, std::function<void()> body) {
-    return counted([&] { return _system.startThread(name, std::move(body)); });
+    return _system.startThread(name, std::move(body));
 }
 
 std::shared_ptr<Host::RunLoop> SessionPlatform::createRunLoop() {
     const auto isServing = std::make_shared<std::latch>(1);
-    auto loop = counted([&] { return std::make_shared<WatchedRunLoop>(_system.createRunLoop(), isServing); });
+    auto loop = std::make_shared<WatchedRunLoop>(_system.createRunLoop(), isServing);
     const std::lock_guard lock(_lock);
     _isServing = isServing;
     return loop;

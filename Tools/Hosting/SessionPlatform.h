@@ -33,21 +33,16 @@ public:
     /// that the system grants none.
     void forgoRealTime() noexcept { _hasRealTime = false; }
 
-    /// Threads and run loops that could not be had, so far: who asked for them may not be able to tell.
-    [[nodiscard]] unsigned failures() const noexcept { return _failures; }
-
     /// Waits until the last run loop has begun to serve, that is until its thread has scheduled all that it
     /// was going to; or until the loop is gone. Returns at once if there is none.
     void waitUntilServing();
 
 private:
     class WatchedRunLoop;
-    template <typename Make> auto counted(const Make &make);
 
     const std::shared_ptr<Ports::LogProvider> _logs;
     Host::Platform &_system;
     Ports::Clock &_clock;
-    std::atomic<unsigned> _failures{0};
     std::atomic<bool> _hasRealTime{true};
     std::mutex _lock;
     std::shared_ptr<std::latch> _isServing; ///< of the last run loop; under the lock

@@ -11,7 +11,17 @@ using namespace Testing;
 
 constexpr const char *kNoAccelerometer = "Failed to create accel system: createEventClient returned nil";
 
-class InputReportThread : public ServiceTest {};
+class InputReportThread : public ServiceTest {
+protected:
+    /// "scheduled", or else why not.
+    std::string status() {
+        const PropertyValue status = get("ServiceStatus");
+        const bool isScheduled = status.find("Scheduled") && *status.find("Scheduled") == PropertyValue(true);
+        const PropertyValue *const reason = status.find("Reason");
+        EXPECT_EQ(isScheduled, reason == nullptr);
+        return reason ? *reason->asString() : "scheduled";
+    }
+};
 
 // --- Its life --------------------------------------------------------------------------------------
 
@@ -67,6 +77,17 @@ TEST_F(InputReportThread, IsNotMissedByAnUnscheduleThatFollowsAtOnce) {
     platform.waitUntilEnded(200);
     EXPECT_EQ(referenceCount(), 1u);
     EXPECT_EQ(queue->references(), 1u);
+}
+
+TEST_F(InputReportThread, IsInTheStatusWhenScheduleReturnsUntilUnscheduleDoes) {
+    EXPECT_EQ(status(), "unscheduled");
+    start();
+    for (int round = 0; round < 20; ++round) {
+        (*hid)->scheduleWithDispatchQueue(hid, queue.get());
+        EXPECT_EQ(status(), "scheduled");
+        unschedule();
+        EXPECT_EQ(status(), "unscheduled");
+    }
 }
 
 TEST_F(InputReportThread, IsNotThereForAnUnscheduleWithoutASchedule) {
@@ -156,11 +177,14 @@ TEST_F(InputReportThread, ThatCannotBeCreatedLeavesNothingScheduled) {
     platform.failsThreads = true;
     (*hid)->scheduleWithDispatchQueue(hid, queue.get());
     EXPECT_EQ(platform.journal.errors(), (Lines{"Failed to start the input report thread: no thread"}));
+    EXPECT_EQ(status(), "no thread");
     EXPECT_EQ(queue->references(), 1u);
     EXPECT_EQ(referenceCount(), 1u);
     unschedule();
+    EXPECT_EQ(status(), "unscheduled");
     platform.failsThreads = false;
     schedule();
+    EXPECT_EQ(status(), "scheduled");
     tap();
     EXPECT_EQ(queue->waiting(), 2u);
 }
@@ -170,6 +194,7 @@ TEST_F(InputReportThread, WithoutASemaphoreIsNotStarted) {
     platform.failsSemaphores = true;
     (*hid)->scheduleWithDispatchQueue(hid, queue.get());
     EXPECT_EQ(platform.journal.errors(), (Lines{"Failed to start the input report thread: no semaphore"}));
+    EXPECT_EQ(status(), "no semaphore");
     EXPECT_EQ(platform.threadsStarted(), 0u);
     EXPECT_EQ(queue->references(), 1u);
     unschedule();
@@ -179,6 +204,7 @@ TEST_F(InputReportThread, WithoutARunLoopEndsAndIsLogged) {
     start();
     platform.failsRunLoops = true;
     (*hid)->scheduleWithDispatchQueue(hid, queue.get());
+    EXPECT_EQ(status(), "no run loop");
     platform.waitUntilEnded(1);
     EXPECT_EQ(platform.journal.errors(), (Lines{"input report thread failed: no run loop"}));
     unschedule();
@@ -199,14 +225,18 @@ TEST_F(InputReportThread, WhoseLoopThrowsIsLoggedAndCleanedUp) {
     EXPECT_EQ(platform.journal.errors(),
               (Lines{kNoAccelerometer, "input report thread failed: the loop broke"}));
     EXPECT_EQ(probe->calls().back(), "unregister 512");
+    EXPECT_EQ(status(), "the loop broke");
     unschedule();
     EXPECT_EQ(platform.journal.count("debug input report thread exited"), 1u);
+    EXPECT_EQ(status(), "unscheduled");
 }
 
 TEST_F(InputReportThread, WhoseLoopThrowsWhatIsNoExceptionIsLoggedAsWell) {
     start();
     platform.beforePass = [] { throw 7; };
     schedule();
+    platform.waitUntilEnded(1);
+    EXPECT_EQ(status(), "unknown exception");
     unschedule();
     EXPECT_EQ(platform.journal.errors(),
               (Lines{kNoAccelerometer, "input report thread failed: unknown exception"}));
@@ -220,6 +250,7 @@ TEST_F(InputReportThread, EndsWhenTheDeviceIsUnplugged) {
     device->unplug();
     platform.waitUntilEnded(1);
     EXPECT_EQ(platform.journal.count("debug input report thread end"), 1u);
+    EXPECT_EQ(status(), "scheduled"); // until the host unschedules it
     unschedule();
     EXPECT_EQ(platform.journal.count("debug input report thread exited"), 1u);
     EXPECT_EQ(queue->runAll(), 2u);

@@ -129,8 +129,8 @@ TEST_F(ServicePropertiesOfADevice, OfAnotherSpellingAreTheDevices) {
 // --- The service's own ---------------------------------------------------------------------------------
 
 TEST_F(ServicePropertiesOfADevice, OfItsOwnAreReadOnlyAndWritesGoToTheDevice) {
-    for (const char *key :
-         {"Version", "FirmwareDebugReports", "FactoryResetHoldDuration", "Recording", "ServicePluginDebug"}) {
+    for (const char *key : {"Version", "FirmwareDebugReports", "FactoryResetHoldDuration", "Recording",
+                            "ServicePluginDebug", "ServiceStatus"}) {
         const PropertyValue before = get(key);
         EXPECT_FALSE(before.isNull()) << key;
         EXPECT_TRUE(set(key, "overwritten")) << key;

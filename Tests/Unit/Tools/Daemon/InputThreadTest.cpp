@@ -2,21 +2,23 @@
 
 #include <gmock/gmock.h>
 
+#include <array>
 #include <functional>
 #include <memory>
 #include <stdexcept>
+#include <utility>
 
 namespace ZorvaTouch::Tools {
 namespace {
 
+using testing::AllOf;
 using testing::HasSubstr;
 using testing::SizeIs;
 
 /// A system that has no more threads, or no more run loops, to give.
 class ShortPlatform final : public Host::Platform {
 public:
-    /// @param failures  Counts what could not be had.
-    ShortPlatform(Host::Platform &system, unsigned &failures) : _system(system), _failures(failures) {}
+    explicit ShortPlatform(Host::Platform &system) : _system(system) {}
 
     Ports::LogProvider &logs() noexcept override { return _system.logs(); }
     Ports::Clock &clock() noexcept override { return _system.clock(); }
@@ -25,13 +27,11 @@ public:
     std::unique_ptr<Host::Thread> startThread(const char *name, std::function<void()> body) override {
         if (hasThreads)
             return _system.startThread(name, std::move(body));
-        ++_failures;
         throw std::runtime_error("no thread");
     }
     std::shared_ptr<Host::RunLoop> createRunLoop() override {
         if (hasLoops)
             return _system.createRunLoop();
-        ++_failures;
         throw std::runtime_error("Too many open files");
     }
     int setRoundRobinPriority(int priority) noexcept override {
@@ -42,7 +42,6 @@ public:
 
 private:
     Host::Platform &_system;
-    unsigned &_failures;
 };
 
 class InputThreads : public Tests::SurfacesFixture {
@@ -57,15 +56,18 @@ protected:
         settle();
     }
 
-    ShortPlatform system{platform, threadFailures};
+    ShortPlatform system{platform};
 };
 
 TEST_F(InputThreads, ThatCannotBeHadAreAFailureOfTheSurfaceWhichIsTriedAgain) {
-    for (bool ShortPlatform::*const has : {&ShortPlatform::hasThreads, &ShortPlatform::hasLoops}) {
+    const std::array<std::pair<bool ShortPlatform::*, const char *>, 2> shortages{
+        {{&ShortPlatform::hasThreads, "cannot read reports: no thread"},
+         {&ShortPlatform::hasLoops, "cannot read reports: Too many open files"}}};
+    for (const auto &[has, reason] : shortages) {
         surfaces->closeAll();
         system.*has = false;
         add();
-        EXPECT_THAT(told.surfaces.lines().back(), HasSubstr("failed"));
+        EXPECT_THAT(told.surfaces.lines().back(), AllOf(HasSubstr("failed"), HasSubstr(reason)));
         EXPECT_THAT(timers.pending(), SizeIs(1));
         system.*has = true;
         fireFirst();

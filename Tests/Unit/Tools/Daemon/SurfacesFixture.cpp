@@ -109,7 +109,6 @@ SurfacesFixture::SurfacesFixture() {
                             .keyMap = KeyMap(),
                             .listener = told,
                             .loop = loop,
-                            .threadFailures = [this] { return platform.failures() + threadFailures; },
                             .log = DaemonLog(*logs, "Surfaces"),
                             .after = timers.timer()},
         [this](const Linux::DeviceIdentity &device) { return makerOf(device); }, clock,

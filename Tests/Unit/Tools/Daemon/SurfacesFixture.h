@@ -126,7 +126,6 @@ protected:
     std::map<std::string, Linux::Tests::FakeOpener> openers;     ///< by node
     std::map<std::string, Ref<Linux::HidrawDevice>> lastDevices; ///< by node, if `keepsDevices`
     bool keepsDevices = false;
-    unsigned threadFailures = 0; ///< beside those that the platform knows
     /// Makes who hears of a device instead of the surface; empty: the surface itself.
     std::function<std::shared_ptr<Linux::HidrawObserver>(std::shared_ptr<Linux::HidrawObserver>)> observedBy;
     Lines came, ended; ///< the surfaces that came, and those that worked and were closed
