@@ -17,7 +17,8 @@
  *                so.
  *   Text         UTF-8. With a length where one is given, ended by NUL where none is.
  *   Tables       `size` is sizeof the table as its maker knew it: newer tables have more entries at the end.
- *                No entry may be null unless it says so. Tables outlive their objects.
+ *                No entry may be null unless it says that it is optional. A table that ends before
+ *                optional entries is accepted, as if they were null. Tables outlive their objects.
  *   Booleans     One byte, 0 or 1.
  *   Exceptions   Never cross the boundary in either direction.
  *   Threads      [host]   the thread on which the host drives the service; it makes one call at a time
@@ -191,7 +192,10 @@ typedef struct ZorvaQueueTable {
     void (*release)(ZorvaQueue *queue);
     /* Returns at once, before or after `run` has begun elsewhere; it must not run it itself, as the input
      * thread waits. 0: refused, neither function will be called. A queue that ends with work left discards
-     * it. */
+     * it. Neither function is null.
+     *
+     * The service calls this under its own lock, and perhaps retain and release. Its properties need that
+     * lock too: a queue that reads or writes a property in here deadlocks. [input] */
     ZorvaBoolean (*submit)(ZorvaQueue *queue, ZorvaFunction run, ZorvaFunction discard, void *context);
 } ZorvaQueueTable;
 struct ZorvaQueue {
@@ -216,11 +220,15 @@ typedef struct ZorvaRunLoopTable {
                               void *context);
     /* Makes a source ready. An unknown number is ignored. Does not block, takes no memory. [any] */
     void (*signalSource)(ZorvaRunLoop *loop, uint64_t source);
-    /* Takes a source away; a loop whose mode has none left finishes. On the loop's own thread `perform` is
-     * not called again; from another thread one call that has begun may still be going on. An unknown number
-     * is ignored. [any] */
+    /* Takes a source away; a loop whose mode has none left finishes. An unknown number is ignored.
+     *
+     * When its context may be freed: on the loop's own thread, after this; `perform` is not called again. On
+     * another thread one call that has begun may still be going on. There, remove the source, and then hand
+     * over to the entry `perform` below, in the same mode, a function that frees the context, as `run` and as
+     * `discard`: either comes after that call. If it returns 0, keep the context. [any] */
     void (*removeSource)(ZorvaRunLoop *loop, uint64_t source);
-    /* Has `run` called on the loop's thread in that mode. 0: no memory, neither function will be called. What
+    /* Has `run` called on the loop's thread in that mode, between two sources. `discard` may be null: there
+     * is nothing to free. 0: no memory, or the mode or `run` is null; neither function will be called. What
      * is left when the loop is gone is discarded. [any] */
     ZorvaBoolean (*perform)(ZorvaRunLoop *loop, const char *mode, ZorvaFunction run, ZorvaFunction discard,
                             void *context);
@@ -304,10 +312,11 @@ typedef struct ZorvaServiceTable {
     void (*release)(ZorvaService *service); /* [any] */
     /* The device of this service, or null. [host] */
     ZorvaDevice *(*createDevice)(ZorvaService *service);
-    /* A client of the host's event system, ZORVA_EVENT_CLIENT_..., or null; the entry itself may be null: the
-     * host has no event system. [input] */
+    /* A client of the host's event system, ZORVA_EVENT_CLIENT_..., or null. The entry is optional: without it
+     * the host has no event system. [input] */
     ZorvaEventClient *(*createEventClient)(ZorvaService *service, uint32_t type);
-    /* Returns whether the service took it. The entry may be null: it takes none. [any] */
+    /* Returns whether the service took it; `value` may be null. The entry is optional: without it the service
+     * takes none. [any] */
     ZorvaBoolean (*setProperty)(ZorvaService *service, const char *key, const ZorvaValue *value);
 } ZorvaServiceTable;
 struct ZorvaService {
@@ -381,8 +390,11 @@ typedef struct HidServiceInterfaceTable {
 
 /* Makes a service. `allocator` is not used and may be null. Returns the interface pointer of
  * kZorvaPlugInInterface with one reference, or null if `type` is not kZorvaHidServicePlugInType or there is
- * no memory. The file may be unloaded when the last Release has returned 0 and the queue has nothing left to
- * run. [any] */
+ * no memory. [any]
+ *
+ * The file may be unloaded when the last Release has returned 0, the queue has nothing left to run, and the
+ * host has released everything else that came from the plug-in: values, events and run loops. Their functions
+ * are in the file, so that a release after the unload crashes. */
 typedef void *(*ZorvaPlugInFactory)(void *allocator, ZorvaUuid type);
 
 /* The factory's name in the file of this plug-in. */

@@ -181,6 +181,32 @@ TEST_F(RunLoops, RemovingTheLastSourceOnAnotherThreadFinishesAPassThatWaits) {
     EXPECT_EQ(pass(), RunOutcome::Finished);
 }
 
+/// What the contract offers to whoever frees the context of a source that it removes on another thread.
+TEST_F(RunLoops, AFunctionHandedOverAfterARemovalComesAfterTheLastCallOfTheSource) {
+    const auto isInCall = platform.createSemaphore();
+    const auto isRemoved = platform.createSemaphore();
+    const auto a = addSource('a', [&] {
+        isInCall->signal();
+        isRemoved->wait();
+        served.push_back('.'); // the context is still needed
+    });
+    RuntimeTests::Callable freeing([this] { served.push_back('f'); });
+    signal(a);
+    const ScopedThread other([&] {
+        isInCall->wait();
+        remove(a);
+        EXPECT_EQ(boundary->table->perform(boundary, "mode", &RuntimeTests::Callable::call,
+                                           &RuntimeTests::Callable::call, &freeing),
+                  1);
+        isRemoved->signal();
+    });
+    passes(1);
+    EXPECT_EQ(served, "a.");
+    signal(addSource('b'));
+    passes(1);
+    EXPECT_EQ(served, "a.fb");
+}
+
 TEST_F(RunLoops, ASourceAddedByAClosureBelongsToThePass) {
     loop->perform("mode", [this] { signal(addSource('a')); });
     EXPECT_EQ(pass(), RunOutcome::HandledSource);
