@@ -13,6 +13,7 @@
 #include <iostream>
 #include <semaphore>
 #include <string>
+#include <utility>
 
 namespace ZorvaTouch {
 namespace {
@@ -38,13 +39,36 @@ long residentKiB() {
     return -1;
 }
 
-/// A host's callback: lets its target go on at a tap.
-void releaseAtATap(void *tapped, void *, void *, const ZorvaEvent *event, std::uint32_t) {
-    std::int64_t mask = 0;
-    event->table->integerField(event, kZorvaFieldDigitizerMask, &mask);
-    if (mask == ZORVA_EVENT_MASK_TAP)
-        static_cast<std::binary_semaphore *>(tapped)->release();
-}
+/// What a host keeps of a service: released before the file is unloaded.
+struct Kept {
+    Ref<const ZorvaEvent> tap;
+    Ref<const ZorvaValue> version;
+};
+
+/// A host that waits for a tap and keeps it.
+class TapKeeper {
+public:
+    static void receive(void *keeper, void *, void *, const ZorvaEvent *event, std::uint32_t) {
+        auto &self = *static_cast<TapKeeper *>(keeper);
+        if (maskOf(event) != ZORVA_EVENT_MASK_TAP)
+            return;
+        self._tap = Ref<const ZorvaEvent>::retain(event);
+        self._isTapped.release();
+    }
+    static std::int64_t maskOf(const ZorvaEvent *event) {
+        std::int64_t mask = 0;
+        event->table->integerField(event, kZorvaFieldDigitizerMask, &mask);
+        return mask;
+    }
+    [[nodiscard]] Ref<const ZorvaEvent> wait() {
+        _isTapped.acquire();
+        return std::move(_tap);
+    }
+
+private:
+    std::binary_semaphore _isTapped{0};
+    Ref<const ZorvaEvent> _tap;
+};
 
 /// A finger on electrode A for three images. The device keeps the reports until the service listens.
 void deliverATap(Simulated::Device &device) {
@@ -55,8 +79,9 @@ void deliverATap(Simulated::Device &device) {
                        0);
 }
 
-/// The whole life of a service: made, driven through a tap, let go of.
-void useService(PlugInInterfaceTable **plugIn, Host::SerialQueue &queue) {
+/// The whole life of a service: made, driven through a tap, released.
+/// @param kept  Gets what outlives the service.
+void useService(PlugInInterfaceTable **plugIn, Host::SerialQueue &queue, Kept &kept) {
     void *found = nullptr;
     ASSERT_EQ((*plugIn)->QueryInterface(plugIn, kZorvaHidServiceInterface, &found), ZORVA_STATUS_SUCCESS);
     const auto hid = static_cast<HidServiceInterfaceTable **>(found);
@@ -64,13 +89,14 @@ void useService(PlugInInterfaceTable **plugIn, Host::SerialQueue &queue) {
     const auto system = Host::EventSystem::create();
     const auto accelerometer = Host::Accelerometer::create(system);
     const auto offered = Host::Service::create(device, system);
-    std::binary_semaphore tapped(0);
+    TapKeeper keeper;
     ASSERT_EQ((*plugIn)->Start(plugIn, nullptr, offered.get()), ZORVA_STATUS_SUCCESS);
     ASSERT_EQ((*hid)->open(hid, 0), 1);
-    (*hid)->setEventCallback(hid, releaseAtATap, &tapped, nullptr);
+    (*hid)->setEventCallback(hid, TapKeeper::receive, &keeper, nullptr);
     (*hid)->scheduleWithDispatchQueue(hid, queue.boundary());
     deliverATap(*device.get());
-    tapped.acquire();
+    kept.tap = keeper.wait();
+    kept.version = Ref<const ZorvaValue>::adopt((*hid)->copyProperty(hid, "Version"));
     (*hid)->unscheduleFromDispatchQueue(hid, queue.boundary());
     queue.drain(); // batches hold the service
     (*hid)->close(hid, 0);
@@ -85,7 +111,11 @@ void loadUseAndUnload(Host::SerialQueue &queue) {
     const Host::PlugInFile file(ZORVA_PLUGIN_FILE);
     void *const made = file.factory(ZORVA_TOUCH_FACTORY_NAME)(nullptr, kZorvaHidServicePlugInType);
     ASSERT_NE(made, nullptr);
-    useService(static_cast<PlugInInterfaceTable **>(made), queue);
+    Kept kept; // goes before the file
+    useService(static_cast<PlugInInterfaceTable **>(made), queue, kept);
+    ASSERT_TRUE(kept.tap && kept.version);
+    EXPECT_EQ(TapKeeper::maskOf(kept.tap.get()), ZORVA_EVENT_MASK_TAP);
+    EXPECT_EQ(kept.version->table->count(kept.version.get()), 3u);
 }
 
 TEST(PlugInUnloading, LeavesNothingAfterEachOfAThousandServices) {
