@@ -4,10 +4,12 @@
  *
  *     CHost PLUGIN RECORDING
  *
- * It needs nothing but the boundary's header and the plug-in's file. Its objects live as long as the process,
- * so retain and release have nothing to do. A real host differs in what the device reads.
+ * It needs nothing but the boundary's header and the plug-in's file; ReportReader.h is for the recording. Its
+ * objects live as long as the process, so retain and release have nothing to do. A real host differs in what
+ * the device reads.
  */
 #define _POSIX_C_SOURCE 200809L /* getdelim */
+#include "ReportReader.h"
 #include <zorvatouch/ZorvaPlugIn.h>
 
 #include <dlfcn.h>
@@ -68,7 +70,7 @@ static const ZorvaQueueTable queueTable = {sizeof queueTable, retainZorvaQueue, 
 static ZorvaQueue queue = {&queueTable};
 
 /* ---- A device that plays the reports of a recording ------------------------------------------------ */
-static const char *position;
+static ReportReader recording;
 static uint8_t *buffer; /* the service's */
 static size_t bufferSize;
 static ZorvaInputReportCallback reportCallback;
@@ -81,25 +83,12 @@ static void registerCallback(ZorvaDevice *device, uint8_t *reports, size_t size,
     buffer = reports, bufferSize = size, reportCallback = callback, reportContext = context;
 }
 
-/* Reads "Data":"01 2a ... " into the buffer. Returns the report's length, 0 at the end of the recording. */
-static size_t readReport(void) {
-    static const char name[] = "\"Data\":\"";
-    size_t length = 0;
-    if (!(position = strstr(position, name)))
-        return 0;
-    for (position += sizeof name - 1; *position && *position != '"' && length < bufferSize;) {
-        char *end;
-        buffer[length++] = (uint8_t)strtoul(position, &end, 16);
-        position = end + (*end == ' ');
-    }
-    return length;
-}
-
 /* The source is ready: one report, on the input thread. A device that has no more goes away and says so. */
 static void deliverReport(void *device) {
-    const size_t length = readReport();
-    if (length > 0) {
-        reportCallback(reportContext, ZORVA_STATUS_SUCCESS, device, 0, buffer[0], buffer, length, 0);
+    size_t length;
+    if (readReport(&recording, buffer, bufferSize, &length)) {
+        const uint32_t id = length > 0 ? buffer[0] : 0;
+        reportCallback(reportContext, ZORVA_STATUS_SUCCESS, device, 0, id, buffer, length, 0);
         deviceLoop->table->signalSource(deviceLoop, deviceSource);
         return;
     }
@@ -156,6 +145,24 @@ static void printEvent(void *stream, void *refcon, void *sender, const ZorvaEven
         fprintf(stream, "%-12s%s\n", gesture, regions[(unsigned)region % 4]);
 }
 
+/* Schedule has no result; a property has the reason if it failed. Like every value and event, it is released
+ * before the plug-in's file is unloaded. */
+static int isScheduled(HidServiceInterfaceTable **hid) {
+    const ZorvaValue *status = (*hid)->copyProperty(hid, "ServiceStatus");
+    int failures = 0;
+    for (size_t index = 0, length; status && index < status->table->count(status); ++index) {
+        const char *key = status->table->key(status, index, &length);
+        if (length != strlen("Reason") || memcmp(key, "Reason", length) != 0)
+            continue;
+        const ZorvaValue *reason = status->table->element(status, index);
+        const char *text = reason->table->stringValue(reason, &length);
+        failures += fprintf(stderr, "CHost: not scheduled: %.*s\n", (int)length, text);
+    }
+    if (status)
+        status->table->release(status);
+    return failures == 0;
+}
+
 /* The life of a service: queried, started, opened, scheduled; then all of it back. */
 static int runService(PlugInInterfaceTable **plugIn) {
     HidServiceInterfaceTable **hid = NULL;
@@ -165,23 +172,25 @@ static int runService(PlugInInterfaceTable **plugIn) {
         return fail("the service", "cannot open the device");
     (*hid)->setEventCallback(hid, printEvent, stdout, NULL);
     (*hid)->scheduleWithDispatchQueue(hid, &queue);
-    while (runNextJob()) { /* until the device is done, and nothing is on its way any more */
+    const int status = isScheduled(hid) ? 0 : 1;
+    while (status == 0 && runNextJob()) { /* until the device is done, and nothing is on its way any more */
     }
     (*hid)->unscheduleFromDispatchQueue(hid, &queue);
     (*hid)->close(hid, 0);
     (*plugIn)->Stop(plugIn);
     (*hid)->Release(hid);
-    return 0;
+    return status;
 }
 
 int main(int argc, char **argv) {
-    char *recording = NULL;
+    char *text = NULL;
     size_t size = 0;
     FILE *file = argc == 3 ? fopen(argv[2], "r") : NULL;
-    if (!file || getdelim(&recording, &size, 0, file) < 0)
+    if (!file || getdelim(&text, &size, 0, file) < 0)
         return fail(argc == 3 ? argv[2] : "usage", argc == 3 ? "cannot be read" : "CHost PLUGIN RECORDING");
     fclose(file);
-    position = recording;
+    if (!openReports(&recording, text))
+        return fail(argv[2], "is not a recording of a known version");
     void *plugInFile = dlopen(argv[1], RTLD_NOW | RTLD_LOCAL);
     if (!plugInFile)
         return fail("the plug-in", dlerror());
@@ -191,8 +200,8 @@ int main(int argc, char **argv) {
     if (!plugIn)
         return fail(argv[1], "makes no HID service");
     const int status = runService(plugIn);
-    if ((*plugIn)->Release(plugIn) == 0) /* nothing of it is left: its code may go */
+    if ((*plugIn)->Release(plugIn) == 0) /* and every value and event is released: its code may go */
         dlclose(plugInFile);
-    free(recording);
+    free(text);
     return status;
 }

@@ -74,6 +74,27 @@ static void checkVersion(HidServiceInterfaceTable **hid) {
     version->table->release(version);
 }
 
+static void checkStatus(HidServiceInterfaceTable **hid) {
+    const ZorvaValue *status = (*hid)->copyProperty(hid, "ServiceStatus");
+    EXPECT(status);
+    if (!status)
+        return;
+    size_t length = 0;
+    EXPECT(status->table->kind(status) == kZorvaValueDictionary);
+    EXPECT(status->table->count(status) == 2);
+    const char *key = status->table->key(status, 0, &length);
+    EXPECT(length == 6 && memcmp(key, "Reason", 6) == 0);
+    const ZorvaValue *reason = status->table->element(status, 0);
+    const char *text = reason->table->stringValue(reason, &length);
+    EXPECT(length == 11 && memcmp(text, "unscheduled", 11) == 0);
+    key = status->table->key(status, 1, &length);
+    EXPECT(length == 9 && memcmp(key, "Scheduled", 9) == 0);
+    const ZorvaValue *scheduled = status->table->element(status, 1);
+    EXPECT(scheduled->table->kind(scheduled) == kZorvaValueBoolean);
+    EXPECT(scheduled->table->booleanValue(scheduled) == 0);
+    status->table->release(status);
+}
+
 static void checkAnswersWithoutADevice(PlugInInterfaceTable **plugIn, HidServiceInterfaceTable **hid) {
     int32_t score = 4711;
     EXPECT((*plugIn)->Probe(plugIn, NULL, NULL, &score) == ZORVA_STATUS_SUCCESS);
@@ -103,6 +124,7 @@ static void checkService(PlugInInterfaceTable **plugIn) {
     checkTables(plugIn, hid);
     checkIdentifiers(plugIn, hid);
     checkVersion(hid);
+    checkStatus(hid);
     checkAnswersWithoutADevice(plugIn, hid);
     EXPECT((*hid)->Release(hid) == 1);
     EXPECT((*plugIn)->Release(plugIn) == 0);
