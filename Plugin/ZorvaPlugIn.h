@@ -9,10 +9,10 @@
  *
  * Conventions of all tables
  *
- *   References   An object lives as long as somebody holds a reference. What is passed as an argument is
- *                borrowed for the call: who keeps it, retains it. What a function called copy or create
- *                returns is a reference that the caller releases. Pointers to text and bytes are borrowed and
- *                last as long as the object that they were asked of.
+ *   References   An object lives as long as there is a reference to it. Arguments are borrowed for the call:
+ *                to keep one longer, retain it. What a function called copy or create returns is a reference
+ *                that the caller releases. Pointers to text and bytes are borrowed and last as long as the
+ *                object that returned them.
  *   Results      Where a function stores something through a pointer, that pointer is not null unless it says
  *                so.
  *   Text         UTF-8. With a length where one is given, ended by NUL where none is.
@@ -75,9 +75,9 @@ enum {
     kZorvaValueDictionary = 7 /* from string to value */
 };
 
-/* What a value may have, whoever made it: levels, a value without parts having one; and parts, the value
- * itself, elements and entries at every level, missing ones among them. A property whose value has more is
- * refused as a whole: a write returns 0 and a read null, with one line in the log. */
+/* Limits of every value. Levels: a value without parts has one. Parts: the value itself, elements and entries
+ * at every level, missing ones included. A property whose value has more is refused as a whole: a write
+ * returns 0 and a read null, with one line in the log. */
 #define ZORVA_VALUE_MAX_LEVELS 64u
 #define ZORVA_VALUE_MAX_PARTS 1000000u
 
@@ -214,8 +214,8 @@ typedef struct ZorvaRunLoopTable {
      * or the function is null. [any] */
     uint64_t (*addSource)(ZorvaRunLoop *loop, const char *mode, ZorvaFunction perform, void *context);
     /* The same for a descriptor: `perform` is called while it is readable, has failed or was hung up. The
-     * descriptor stays its owner's, who removes the source before closing it. 0 also for one that is not open
-     * or cannot be polled: a regular file, a folder. [any] */
+     * descriptor stays its owner's; remove the source before closing it. 0 also for one that is not open or
+     * cannot be polled: a regular file, a folder. [any] */
     uint64_t (*addDescriptor)(ZorvaRunLoop *loop, const char *mode, int descriptor, ZorvaFunction perform,
                               void *context);
     /* Makes a source ready. An unknown number is ignored. Does not block, takes no memory. [any] */
@@ -282,7 +282,7 @@ typedef struct ZorvaEventClient ZorvaEventClient;
 /* Receives an event of an event client. `event` is borrowed for the call. [input] */
 typedef void (*ZorvaEventClientCallback)(void *context, const ZorvaEvent *event);
 
-/* A connection to the host's event system: finds services and hears their events. [input] */
+/* A connection to the host's event system: finds services and receives their events. [input] */
 typedef struct ZorvaEventClientTable {
     size_t size;
     void (*retain)(ZorvaEventClient *client);  /* [any] */
@@ -302,7 +302,7 @@ struct ZorvaEventClient {
     const ZorvaEventClientTable *table;
 };
 
-/* The kind of event client that monitors: it hears events and changes nothing. */
+/* The kind of event client that monitors: it receives events and changes nothing. */
 #define ZORVA_EVENT_CLIENT_MONITOR 1u
 
 /* What the host offers: the place where a device, or an accelerometer, is attached. */
@@ -351,10 +351,10 @@ typedef struct PlugInInterfaceTable {
     uint16_t revision; /* 0 */
     /* Whether the service fits; it always does. `outScore`, which may be null, is left as it is. [host] */
     ZorvaStatus (*Probe)(void *self, const ZorvaValue *properties, ZorvaService *service, int32_t *outScore);
-    /* Creates the device; the service keeps what `service` offers until Stop. ZORVA_STATUS_NO_RESOURCES:
-     * there is none. A second start lets go of the first device. [host] */
+    /* Creates the device; the service keeps it and `service` until Stop. ZORVA_STATUS_NO_RESOURCES: `service`
+     * has no device. A second start releases the first device. [host] */
     ZorvaStatus (*Start)(void *self, const ZorvaValue *properties, ZorvaService *service);
-    /* Lets go of the device. Unschedule and close it before. Always succeeds. [host] */
+    /* Releases the device. Unschedule and close it before. Always succeeds. [host] */
     ZorvaStatus (*Stop)(void *self);
 } PlugInInterfaceTable;
 
@@ -363,16 +363,16 @@ typedef struct HidServiceInterfaceTable {
     ZorvaStatus (*QueryInterface)(void *self, ZorvaUuid identifier, void **outInterface);
     uint32_t (*AddRef)(void *self);
     uint32_t (*Release)(void *self);
-    /* Opens the device with these options. 1: done; 0: it failed, or there is none. After Start. [host] */
+    /* Opens the device with these options. 1: done; 0: it failed, or was not created. After Start. [host] */
     ZorvaBoolean (*open)(void *self, uint32_t options);
     /* Closes it. After unschedule. [host] */
     void (*close)(void *self, uint32_t options);
-    /* A property, or null if there is none of that name. At any time but during Start and Stop. [any] */
+    /* A property, or null if it has no value or cannot be read. Not during Start and Stop. [any] */
     const ZorvaValue *(*copyProperty)(void *self, const char *key);
     /* Writes a property; the result is whether it was taken. `value` may be null. Likewise. [any] */
     ZorvaBoolean (*setProperty)(void *self, const char *key, const ZorvaValue *value);
-    /* Who gets the events from the next schedule on. `target` and `refcon` are handed back and not looked
-     * at. [host] */
+    /* Sets the function that receives the events from the next schedule on. `target` and `refcon` are passed
+     * to it and not read. [host] */
     void (*setEventCallback)(void *self, ZorvaEventCallback callback, void *target, void *refcon);
     /* Starts the input thread, and returns when the thread has its run loop; the device is scheduled on that
      * loop, and its first report read, at some time after. The property "ServiceStatus" says whether the

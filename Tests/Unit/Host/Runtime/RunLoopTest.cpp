@@ -181,7 +181,7 @@ TEST_F(RunLoops, RemovingTheLastSourceOnAnotherThreadFinishesAPassThatWaits) {
     EXPECT_EQ(pass(), RunOutcome::Finished);
 }
 
-/// What the contract offers to whoever frees the context of a source that it removes on another thread.
+/// The completion of a removal on another thread: it may free the source's context.
 TEST_F(RunLoops, AFunctionHandedOverAfterARemovalComesAfterTheLastCallOfTheSource) {
     const auto isInCall = platform.createSemaphore();
     const auto isRemoved = platform.createSemaphore();
