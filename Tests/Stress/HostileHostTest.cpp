@@ -103,6 +103,7 @@ protected:
                                                 "Version",
                                                 "Recording",
                                                 "ServicePluginDebug",
+                                                "ServiceStatus",
                                                 "FirmwareDebugReports",
                                                 "\xFF\xFE\x01",
                                                 "%s%n{}"};
