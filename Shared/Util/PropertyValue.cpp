@@ -3,16 +3,27 @@
 #include "Shared/Util/Numeric.h"
 
 #include <limits>
+#include <utility>
 
 namespace ZorvaTouch {
 
 static_assert(std::numeric_limits<float>::is_iec559,
               "narrowing to float rounds to nearest or to an infinity");
 
+PropertyValue::PropertyValue(std::string value)
+    : _value(std::make_shared<const std::string>(std::move(value))) {}
 PropertyValue::PropertyValue(Bytes value) : _value(std::make_shared<const Bytes>(std::move(value))) {}
 PropertyValue::PropertyValue(Array value) : _value(std::make_shared<const Array>(std::move(value))) {}
 PropertyValue::PropertyValue(Dictionary value)
     : _value(std::make_shared<const Dictionary>(std::move(value))) {}
+
+PropertyValue::PropertyValue(PropertyValue &&other) noexcept : _value(std::exchange(other._value, {})) {}
+
+PropertyValue &PropertyValue::operator=(PropertyValue &&other) noexcept {
+    if (this != &other)
+        _value = std::exchange(other._value, {});
+    return *this;
+}
 
 const PropertyValue *PropertyValue::find(std::string_view key) const noexcept {
     const Dictionary *dictionary = asDictionary();
@@ -56,6 +67,8 @@ bool operator==(const PropertyValue &left, const PropertyValue &right) {
     if (left.kind() != right.kind())
         return false;
     switch (left.kind()) {
+    case PropertyValue::Kind::String:
+        return *left.asString() == *right.asString();
     case PropertyValue::Kind::Bytes:
         return *left.asBytes() == *right.asBytes();
     case PropertyValue::Kind::Array:

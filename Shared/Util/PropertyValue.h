@@ -13,9 +13,9 @@ namespace ZorvaTouch {
 
 /// A dynamically typed value: state values, property values and the values inside recordings.
 ///
-/// Values are immutable once made, so a copy of an array or a dictionary shares the original's storage and
-/// copies may be read from several threads. Negative integers have no kind of their own and travel as
-/// `Double`.
+/// Values are immutable once made, so a copy shares the original's text, bytes, elements or entries: it
+/// allocates nothing, cannot fail, and may be read on another thread. Negative integers have no kind of their
+/// own and travel as `Double`.
 class PropertyValue {
 public:
     using Bytes = std::vector<std::uint8_t>;
@@ -31,12 +31,18 @@ public:
     requires(!std::same_as<T, bool>) PropertyValue(T value) : _value(static_cast<std::uint64_t>(value)) {}
     template <std::floating_point T> PropertyValue(T value) : _value(static_cast<double>(value)) {}
     template <std::signed_integral T> PropertyValue(T) = delete; ///< say what is meant: unsigned or double
-    PropertyValue(std::string value) : _value(std::move(value)) {}
-    PropertyValue(std::string_view value) : _value(std::string(value)) {}
-    PropertyValue(const char *value) : _value(std::string(value)) {}
+    PropertyValue(std::string value);
+    PropertyValue(std::string_view value) : PropertyValue(std::string(value)) {}
+    PropertyValue(const char *value) : PropertyValue(std::string(value)) {}
     PropertyValue(Bytes value);
     PropertyValue(Array value);
     PropertyValue(Dictionary value);
+
+    PropertyValue(const PropertyValue &other) noexcept = default;
+    PropertyValue &operator=(const PropertyValue &other) noexcept = default;
+    PropertyValue(PropertyValue &&other) noexcept; ///< leaves `other` null
+    PropertyValue &operator=(PropertyValue &&other) noexcept;
+    ~PropertyValue() = default;
 
     [[nodiscard]] Kind kind() const noexcept { return static_cast<Kind>(_value.index()); }
     [[nodiscard]] bool isNull() const noexcept { return kind() == Kind::Null; }
@@ -47,7 +53,7 @@ public:
         return std::get_if<std::uint64_t>(&_value);
     }
     [[nodiscard]] const double *asDouble() const noexcept { return std::get_if<double>(&_value); }
-    [[nodiscard]] const std::string *asString() const noexcept { return std::get_if<std::string>(&_value); }
+    [[nodiscard]] const std::string *asString() const noexcept { return pointee<std::string>(); }
     [[nodiscard]] const Bytes *asBytes() const noexcept { return pointee<Bytes>(); }
     [[nodiscard]] const Array *asArray() const noexcept { return pointee<Array>(); }
     [[nodiscard]] const Dictionary *asDictionary() const noexcept { return pointee<Dictionary>(); }
@@ -73,9 +79,10 @@ private:
         return shared ? shared->get() : nullptr;
     }
 
-    // In the order of Kind.
-    std::variant<std::monostate, bool, std::uint64_t, double, std::string, std::shared_ptr<const Bytes>,
-                 std::shared_ptr<const Array>, std::shared_ptr<const Dictionary>>
+    // In the order of Kind. No alternative's copy may throw: libstdc++ 12 mishandles one that does.
+    std::variant<std::monostate, bool, std::uint64_t, double, std::shared_ptr<const std::string>,
+                 std::shared_ptr<const Bytes>, std::shared_ptr<const Array>,
+                 std::shared_ptr<const Dictionary>>
         _value;
 };
 

@@ -2,7 +2,9 @@
 
 #include <cmath>
 #include <limits>
+#include <string>
 #include <type_traits>
+#include <utility>
 
 #include <gtest/gtest.h>
 
@@ -158,11 +160,47 @@ TEST(PropertyValue, ContainersAreComparedByContent) {
     EXPECT_NE(PropertyValue(Array{1u}), PropertyValue(Array{1u, 1u}));
 }
 
-TEST(PropertyValue, CopiesOfContainersShareTheirStorage) {
-    const PropertyValue original(Array{1u, 2u});
-    const PropertyValue copy = original;
-    EXPECT_EQ(copy.asArray(), original.asArray()); // the same storage, and immutable
-    EXPECT_EQ(copy, original);
+TEST(PropertyValue, CopiesShareTheirStorage) {
+    const PropertyValue array(Array{1u, 2u});
+    const PropertyValue copy = array;
+    EXPECT_EQ(copy.asArray(), array.asArray()); // the same storage, and immutable
+    EXPECT_EQ(copy, array);
+    const PropertyValue text(std::string(100, 'x'));
+    PropertyValue assigned;
+    assigned = text;
+    EXPECT_EQ(assigned.asString(), text.asString());
+    EXPECT_EQ(assigned, text);
+}
+
+// A copy that could fail would have to allocate.
+static_assert(std::is_nothrow_copy_constructible_v<PropertyValue> &&
+              std::is_nothrow_copy_assignable_v<PropertyValue>);
+static_assert(std::is_nothrow_move_constructible_v<PropertyValue> &&
+              std::is_nothrow_move_assignable_v<PropertyValue>);
+
+TEST(PropertyValue, IsNullWhenItWasMovedFrom) {
+    for (const PropertyValue &value :
+         {PropertyValue(true), PropertyValue(7u), PropertyValue("text"), PropertyValue(Bytes{1}),
+          PropertyValue(Array{1u}), PropertyValue(Dictionary{{"a", 1u}})}) {
+        PropertyValue from = value;
+        const PropertyValue made(std::move(from));
+        EXPECT_EQ(made, value);
+        EXPECT_TRUE(from.isNull()); // NOLINT(bugprone-use-after-move): that is what is tested
+        from = value;
+        PropertyValue assigned("before");
+        assigned = std::move(from);
+        EXPECT_EQ(assigned, value);
+        EXPECT_TRUE(from.isNull()); // NOLINT(bugprone-use-after-move)
+        PropertyValue &same = assigned;
+        assigned = std::move(same);
+        EXPECT_EQ(assigned, value);
+    }
+}
+
+TEST(PropertyValue, TextsAreComparedByContent) {
+    EXPECT_EQ(PropertyValue(std::string("text")), PropertyValue("text"));
+    EXPECT_NE(PropertyValue("text"), PropertyValue("texT"));
+    EXPECT_NE(PropertyValue("text"), PropertyValue(std::string("text\0", 5)));
 }
 
 TEST(PropertyValue, DictionariesAreOrderedByKey) {
