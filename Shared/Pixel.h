@@ -4,6 +4,7 @@
 
 #include <array>
 #include <cstdint>
+#include <string>
 #include <string_view>
 
 namespace ZorvaTouch {
@@ -68,15 +69,16 @@ struct Pixel {
 
 /// A channel made of a group of neighbouring electrodes.
 struct VirtualPixel : Pixel {
-    /// @param letters  The members' letters. Borrowed for the life of the program (they are literals).
+    /// @param letters  The members' letters, at least one. Copied.
     ///
     /// Until the first frame `index` is the character code of the name's first letter, 65 for 'A', and no
     /// electrode: that is meant and harmless, every frame overwrites it before anything reads it.
-    VirtualPixel(std::string_view letters, float channelGain) noexcept
+    VirtualPixel(std::string_view letters, float channelGain)
         : Pixel(letters.front(), channelGain), name(letters) {}
 
-    std::string_view name;
+    std::string name;
 
+    using Pixel::updatePixelState; ///< takes a value and leaves `index` as it is
     /// Takes one frame's sum and the electrode that dominates it.
     void updatePixelState(std::int32_t rawSum, float activationThreshold,
                           std::int32_t dominantIndex) noexcept {

@@ -2,6 +2,7 @@
 
 #include <cmath>
 #include <limits>
+#include <string>
 #include <vector>
 
 #include <gtest/gtest.h>
@@ -463,6 +464,24 @@ TEST(VirtualPixel, TakesItsSumAndThenItsDominantElectrode) {
     EXPECT_FALSE(pixel.isTouched);
     EXPECT_EQ(pixel.index, 12);
     EXPECT_EQ(pixel.getPixelRegion(), kPixelRegionVolumeDown);
+}
+
+TEST(VirtualPixel, TakesAValueAlone) {
+    VirtualPixel pixel("GHI", 0.5f);
+    pixel.updatePixelState(600, 200.0f, 7);
+    pixel.updatePixelState(800, 200.0f);
+    EXPECT_EQ(pixel.value, 400);
+    EXPECT_EQ(pixel.normalizedValue, 2.0f);
+    EXPECT_EQ(pixel.index, 7) << "stays";
+}
+
+TEST(VirtualPixel, KeepsANameThatWasMadeAtRunTime) {
+    for (const char *name : {"GHI", "ABCDEFGHIJKLMNO with more than a short string"}) {
+        std::string letters = name;
+        const VirtualPixel pixel(letters, 1.0f);
+        letters.assign(letters.size(), 'Z');
+        EXPECT_EQ(pixel.name, name);
+    }
 }
 
 TEST(VirtualPixel, SumsBeyondSixteenBitsAreTaken) {
