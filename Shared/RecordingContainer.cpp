@@ -179,8 +179,8 @@ std::optional<std::uint64_t> knownVersion(const PropertyValue &version) {
     return std::nullopt;
 }
 
-/// The number as it stands in the text. Negative whole numbers read as floating point and are shown without
-/// ".0".
+/// The number in decimal. A negative whole number is floating point, whether it was written so or not, and is
+/// shown without ".0".
 std::string versionText(const PropertyValue &version) {
     const double *number = version.asDouble();
     const bool isNegativeInteger =
@@ -193,12 +193,14 @@ std::string versionText(const PropertyValue &version) {
 }
 
 /// The known version that a container's member gives; null if there is no such member.
-std::uint64_t versionFrom(const PropertyValue *version) {
+/// @param written  The number as it is written in the text; empty if it is only known as a value.
+std::uint64_t versionFrom(const PropertyValue *version, std::string_view written = {}) {
     if (!version || !(version->asUnsigned() || version->asDouble())) // a boolean is no number here
         throw std::invalid_argument("invalid version");
     const auto known = knownVersion(*version);
     if (!known)
-        throw std::invalid_argument("invalid container version: " + versionText(*version));
+        throw std::invalid_argument("invalid container version: " +
+                                    (written.empty() ? versionText(*version) : std::string(written)));
     return *known;
 }
 
@@ -381,8 +383,11 @@ private:
                 readList({&_current, &_version1});
             else if (name == kReportsKey)
                 readList({&_version0});
-            else if (const Util::JsonValue value = _stream.value(); name == kVersionKey)
+            else if (const Util::JsonValue value = _stream.value(); name == kVersionKey) {
                 _version = value.toPropertyValue();
+                if (value.kind() == Util::JsonValue::Kind::Number)
+                    _writtenVersion = _stream.lastText();
+            }
         }
     }
 
@@ -404,7 +409,7 @@ private:
 
     [[nodiscard]] std::uint64_t requireVersion() const {
         try {
-            return versionFrom(_version ? &*_version : nullptr);
+            return versionFrom(_version ? &*_version : nullptr, _writtenVersion);
         } catch (const std::invalid_argument &error) {
             throw ContainerError(error.what());
         }
@@ -418,6 +423,7 @@ private:
 
     Util::JsonStream _stream;
     std::optional<PropertyValue> _version;
+    std::string _writtenVersion;
     FramesMember _current{nullptr};
     FramesMember _version1{frameWithData};
     FramesMember _version0{currentFrameFromReport};

@@ -68,6 +68,7 @@ JsonValue JsonStream::value() {
         _parser.parse(std::string_view(_buffer).substr(_begin, length), &reason, kJsonMaxDepth - _levels);
     require(value.has_value(), reason.c_str());
     _begin += length;
+    _lastLength = length;
     return *value;
 }
 

@@ -47,6 +47,10 @@ public:
 
     /// Takes the whole value that comes next. Valid until the stream is next used.
     [[nodiscard]] JsonValue value();
+    /// The text of the value that was taken last, as it is written. Valid as long as that value.
+    [[nodiscard]] std::string_view lastText() const noexcept {
+        return std::string_view(_buffer).substr(_begin - _lastLength, _lastLength);
+    }
 
     /// Requires that nothing but white space is left.
     void finish();
@@ -70,11 +74,12 @@ private:
 
     TextPieces _pieces;
     std::string _buffer;
-    std::size_t _begin = 0;     ///< of what is not yet taken, in the buffer
-    std::size_t _end = 0;       ///< of what has arrived
-    std::uint64_t _dropped = 0; ///< bytes of the text before the buffer
-    std::size_t _levels = 0;    ///< entered and not left
-    bool _isFirst = true;       ///< in the array or object that was entered last
+    std::size_t _begin = 0;      ///< of what is not yet taken, in the buffer
+    std::size_t _end = 0;        ///< of what has arrived
+    std::size_t _lastLength = 0; ///< of the value that was taken last, right before `_begin`
+    std::uint64_t _dropped = 0;  ///< bytes of the text before the buffer
+    std::size_t _levels = 0;     ///< entered and not left
+    bool _isFirst = true;        ///< in the array or object that was entered last
     JsonParser _parser;
 };
 

@@ -577,7 +577,34 @@ TEST(RecordingContainer, UnknownVersionsArePrinted) {
     EXPECT_EQ(refusal(container("18446744073709551615", "")),
               migrationRefusal("invalid container version: 18446744073709551615"));
     EXPECT_EQ(refusal(container("-1", "")), migrationRefusal("invalid container version: -1"));
-    EXPECT_EQ(refusal(container("1e300", "")), migrationRefusal("invalid container version: 1e+300"));
+}
+
+TEST(RecordingContainer, UnknownVersionsArePrintedAsTheyAreWritten) {
+    for (const char *version :
+         {"-2", "-2.0", "-0.5", "3.0", "3.00", "1e300", "1E+300", "4e0", "0.30", "2.50"}) {
+        const std::string expected = migrationRefusal(std::string("invalid container version: ") + version);
+        EXPECT_EQ(refusal(container(version, "")), expected);
+        EXPECT_EQ(refusal("{ \"Version\"\t:\n" + std::string(version) + " }"), expected);
+        EXPECT_EQ(
+            refusal(
+                R"({"a":{"Version":8},"b":["Version"],"c":"Version","Version":[9],"\\\"":1,"\u0056ersion":)" +
+                std::string(version) + R"(,"d":{"Version":7}})"),
+            expected);
+    }
+}
+
+TEST(RecordingContainer, AParsedVersionIsPrintedInDecimal) {
+    const auto message = [](PropertyValue version) -> std::string {
+        try {
+            (void)migrateRecordingContainer(PropertyValue::Dictionary{{"Version", std::move(version)}});
+        } catch (const std::invalid_argument &error) {
+            return error.what();
+        }
+        return "nothing was thrown";
+    };
+    EXPECT_EQ(message(3u), "invalid container version: 3");
+    EXPECT_EQ(message(-2.0), "invalid container version: -2");
+    EXPECT_EQ(message(2.5), "invalid container version: 2.5");
 }
 
 TEST(RecordingContainer, AVersionMustBeANumber) {
