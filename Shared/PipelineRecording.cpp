@@ -26,9 +26,6 @@ PipelineRecording::PipelineRecording(Ports::Clock &clock) : PipelineRecording(Fr
 PipelineRecording::PipelineRecording(std::optional<std::string_view> jsonData, Ports::Clock &clock)
     : PipelineRecording(framesFromJson(jsonData), clock) {}
 
-PipelineRecording::PipelineRecording(FrameList frames, Ports::Clock &clock)
-    : _clock(&clock), _ticks(clock), _frames(std::move(frames)) {}
-
 PipelineRecording::PipelineRecording(const PipelineRecording &other)
     : PipelineInput(other), pipeline(other.pipeline), _clock(other._clock), _ticks(other._ticks),
       _frames(other._frames), _maxFrameCount(other._maxFrameCount) {}

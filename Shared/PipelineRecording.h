@@ -5,12 +5,14 @@
 #include "Shared/Ports/Clock.h"
 #include "Shared/Util/Ticks.h"
 
+#include <concepts>
 #include <cstddef>
 #include <cstdint>
 #include <memory>
 #include <optional>
 #include <string>
 #include <string_view>
+#include <utility>
 
 namespace ZorvaTouch {
 
@@ -36,8 +38,11 @@ public:
     /// @throws std::runtime_error     "migrateSerializedContainer failed: ..." for text that is no container.
     PipelineRecording(std::optional<std::string_view> jsonData, Ports::Clock &clock);
 
-    /// Frames that were read already.
-    PipelineRecording(FrameList frames, Ports::Clock &clock);
+    /// Frames that were read already: a `FrameList` and nothing that turns into one, so that `{}` is the text
+    /// that was not supplied.
+    template <std::same_as<FrameList> Frames>
+    PipelineRecording(Frames frames, Ports::Clock &clock)
+        : _clock(&clock), _ticks(clock), _frames(std::move(frames)) {}
 
     // A copy has the same frames, bound and pipeline, but it is not playing.
     PipelineRecording(const PipelineRecording &other);

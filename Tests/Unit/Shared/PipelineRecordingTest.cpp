@@ -263,6 +263,21 @@ TEST_F(PipelineRecordingTest, NoTextIsAnError) {
     }
 }
 
+template <typename Clock>
+concept TakesBraces = requires(Clock &clock) {
+    PipelineRecording({}, clock);
+};
+static_assert(TakesBraces<Ports::Clock>, "one constructor, not two, is meant");
+
+TEST_F(PipelineRecordingTest, EmptyBracesAreATextThatWasNotSupplied) {
+    try {
+        const PipelineRecording read({}, clock);
+        FAIL() << "nothing was thrown";
+    } catch (const std::invalid_argument &error) {
+        EXPECT_STREQ(error.what(), "json not supplied");
+    }
+}
+
 TEST_F(PipelineRecordingTest, FramesCanBeHandedOver) {
     const PipelineRecording made(Scripted::listFromShortHand("R1@9 R2@3"), clock);
     EXPECT_EQ(shortHand(made.frames()), "R1 R2");
