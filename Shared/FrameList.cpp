@@ -86,7 +86,7 @@ struct FrameList::Chunk {
     }
 
     void addOther(std::shared_ptr<const Frame> frame) {
-        others.push_back(std::move(frame));
+        others.push_back(std::move(frame)); // throws before anything has changed, or not at all
         stateCount += others.back()->type == FrameType::State;
         Slot &slot = slots[count++];
         slot.timestampNs = others.back()->timestampNs;
@@ -105,6 +105,13 @@ struct FrameList::Chunk {
     void addCopies(const Chunk &from, SlotMask which) {
         for (; which != 0; which &= which - 1)
             addCopy(from, static_cast<std::size_t>(std::countr_zero(which)));
+    }
+
+    void removeLast() noexcept {
+        if (slots[--count].length != kNotInline)
+            return;
+        stateCount -= others.back()->type == FrameType::State;
+        others.pop_back();
     }
 
     void clear() noexcept {
@@ -127,7 +134,7 @@ struct FrameList::Chunk {
         return mask;
     }
 };
-static_assert(sizeof(FrameList) <= 64);
+static_assert(sizeof(FrameList) <= 80);
 
 FrameList::ChunkRef::ChunkRef(const ChunkRef &other) noexcept : _chunk(other._chunk) {
     if (_chunk)
@@ -168,13 +175,14 @@ FrameList &FrameList::operator=(const FrameList &other) {
 }
 
 FrameList::FrameList(FrameList &&other) noexcept
-    : _entries(std::exchange(other._entries, {})), _spares(std::exchange(other._spares, {})),
-      _size(std::exchange(other._size, 0)) {}
+    : _entries(std::exchange(other._entries, {})), _scratch(std::exchange(other._scratch, {})),
+      _spares(std::exchange(other._spares, {})), _size(std::exchange(other._size, 0)) {}
 
 FrameList &FrameList::operator=(FrameList &&other) noexcept {
     if (this == &other)
         return *this;
     _entries = std::exchange(other._entries, {});
+    _scratch = std::exchange(other._scratch, {});
     _spares = std::exchange(other._spares, {});
     _size = std::exchange(other._size, 0);
     return *this;
@@ -212,27 +220,47 @@ FrameList::Iterator &FrameList::Iterator::operator++() noexcept {
 }
 
 void FrameList::append(Frame frame) {
-    if (frame.type == FrameType::InputReport && frame.data.size() <= kInlineReportLength)
+    const bool isPlainReport =
+        frame.type == FrameType::InputReport && frame.key.empty() && frame.value.isNull();
+    if (isPlainReport && frame.data.size() <= kInlineReportLength)
         return appendReport(frame.timestampNs, frame.data);
     auto shared = std::make_shared<const Frame>(std::move(frame));
-    openChunk().addOther(std::move(shared));
-    ++_size;
+    appendBy([&shared](Chunk &chunk) { chunk.addOther(std::move(shared)); });
 }
 
 void FrameList::appendReport(std::uint64_t timestampNs, std::span<const std::uint8_t> report) {
     if (report.size() > kInlineReportLength)
         return append({FrameType::InputReport, timestampNs, {}, {}, {report.begin(), report.end()}});
-    openChunk().addReport(timestampNs, report);
-    ++_size;
+    appendBy([timestampNs, report](Chunk &chunk) { chunk.addReport(timestampNs, report); });
 }
 
-FrameList::Chunk &FrameList::openChunk() {
+void FrameList::appendCopy(const Chunk &chunk, std::size_t slot) {
+    appendBy([&chunk, slot](Chunk &open) { open.addCopy(chunk, slot); });
+}
+
+template <typename Fill> void FrameList::appendBy(const Fill &fill) {
     // A chunk in the middle that a trim has thinned may end up last while a copy still shares it.
     const bool canGrow =
         !_entries.empty() && !_entries.back().chunk->isFull() && _entries.back().chunk.isSole();
-    if (!canGrow)
-        _entries.push_back({takeChunk(), _size});
-    return *_entries.back().chunk;
+    if (canGrow) {
+        fill(*_entries.back().chunk);
+    } else {
+        // The frame is in the chunk before the chunk is in the list: an empty one is never listed.
+        ChunkRef fresh = takeChunk();
+        fill(*fresh);
+        _entries.push_back({std::move(fresh), _size});
+    }
+    ++_size;
+}
+
+void FrameList::undoAppend() noexcept {
+    ChunkRef &last = _entries.back().chunk;
+    last->removeLast();
+    --_size;
+    if (last->count == 0) {
+        giveBack(std::move(last));
+        _entries.pop_back();
+    }
 }
 
 FrameList::ChunkRef FrameList::takeChunk() {
@@ -243,70 +271,74 @@ FrameList::ChunkRef FrameList::takeChunk() {
     return chunk;
 }
 
-void FrameList::giveBack(ChunkRef chunk) {
-    if (!chunk.isSole())
+void FrameList::giveBack(ChunkRef chunk) noexcept {
+    if (!chunk.isSole() || _spares.size() == _spares.capacity()) // no room is no harm: it is freed
         return;
     chunk->clear();
     _spares.push_back(std::move(chunk));
 }
 
-void FrameList::keepOnly(Entry &entry, std::uint64_t mask) {
-    if (countOf(mask) == entry.chunk->count)
-        return;
-    ChunkRef thinned;
-    if (mask != 0) {
-        thinned = takeChunk();
-        thinned->addCopies(*entry.chunk, mask);
+void FrameList::trim(std::uint64_t maxCount) {
+    // What may run out of memory comes first and works beside the list.
+    Entries entries = thinned(maxCount);
+    std::size_t kept = 0;
+    for (const Entry &entry : entries)
+        kept += entry.chunk->count;
+    const bool isSparse = entries.size() > 2 * (kept / kFramesPerChunk) + 4;
+    if (isSparse) {
+        FrameList dense;
+        for (auto entry = entries.rbegin(); entry != entries.rend(); ++entry)
+            for (std::size_t slot = 0; slot < entry->chunk->count; ++slot)
+                dense.appendCopy(*entry->chunk, slot);
+        *this = std::move(dense);
+    } else {
+        _spares.reserve(_entries.size() + _spares.size());
+        std::reverse(entries.begin(), entries.end());
+        replaceEntries(std::move(entries));
     }
-    giveBack(std::exchange(entry.chunk, std::move(thinned)));
+    limitSpares(maxCount);
 }
 
-void FrameList::renumber() noexcept {
-    std::erase_if(_entries, [](const Entry &entry) { return !entry.chunk.get(); });
+FrameList::Entries FrameList::thinned(std::uint64_t maxCount) {
+    Entries entries = std::exchange(_scratch, {});
+    entries.reserve(_entries.size());
+    TrimRule rule(maxCount);
+    for (auto entry = _entries.rbegin(); entry != _entries.rend(); ++entry) {
+        const Chunk &chunk = *entry->chunk;
+        const SlotMask mask = chunk.keptBy(rule);
+        if (countOf(mask) == chunk.count) {
+            entries.push_back(*entry);
+        } else if (mask != 0) {
+            ChunkRef part = takeChunk();
+            part->addCopies(chunk, mask);
+            entries.push_back({std::move(part), 0});
+        }
+    }
+    return entries;
+}
+
+void FrameList::replaceEntries(Entries entries) noexcept {
+    _entries.swap(entries);
     _size = 0;
     for (Entry &entry : _entries) {
         entry.firstIndex = _size;
         _size += entry.chunk->count;
     }
+    for (Entry &dropped : entries)
+        giveBack(std::move(dropped.chunk)); // one that stays has another owner: the list
+    entries.clear();
+    _scratch = std::move(entries);
 }
 
-std::size_t FrameList::trim(std::uint64_t maxCount, std::size_t cursor) {
-    // However the walk ends, the list is left in order.
-    struct Renumbering {
-        FrameList &list;
-        ~Renumbering() { list.renumber(); }
-    };
-    std::size_t keptBeforeCursor = 0;
-    {
-        const Renumbering renumbering{*this};
-        TrimRule rule(maxCount);
-        for (std::size_t i = _entries.size(); i-- > 0;) {
-            Entry &entry = _entries[i];
-            const SlotMask mask = entry.chunk->keptBy(rule);
-            if (cursor > entry.firstIndex)
-                keptBeforeCursor += countOf(mask & maskBelow(cursor - entry.firstIndex));
-            keepOnly(entry, mask);
-        }
+std::size_t FrameList::countKept(std::uint64_t maxCount, std::size_t first) const {
+    // Whether a frame is kept depends on itself and on newer ones.
+    TrimRule rule(maxCount);
+    std::size_t kept = 0;
+    for (auto entry = _entries.rbegin(); entry != _entries.rend(); ++entry) {
+        const SlotMask older = first > entry->firstIndex ? maskBelow(first - entry->firstIndex) : 0;
+        kept += countOf(entry->chunk->keptBy(rule) & ~older);
     }
-    defragment();
-    limitSpares(maxCount);
-    return keptBeforeCursor;
-}
-
-void FrameList::defragment() {
-    const bool isSparse = _entries.size() > 2 * (_size / kFramesPerChunk) + 4;
-    if (!isSparse)
-        return;
-    FrameList dense;
-    for (const Entry &entry : _entries)
-        for (std::size_t slot = 0; slot < entry.chunk->count; ++slot)
-            dense.appendCopy(*entry.chunk, slot);
-    *this = std::move(dense);
-}
-
-void FrameList::appendCopy(const Chunk &chunk, std::size_t slot) {
-    openChunk().addCopy(chunk, slot);
-    ++_size;
+    return kept;
 }
 
 void FrameList::limitSpares(std::uint64_t maxCount) noexcept {
@@ -319,10 +351,9 @@ void FrameList::limitSpares(std::uint64_t maxCount) noexcept {
         _spares.erase(_spares.begin() + static_cast<std::ptrdiff_t>(wanted), _spares.end());
 }
 
-std::size_t FrameList::sort(std::size_t cursor) {
+void FrameList::sort() {
     struct Place {
         std::uint64_t timestampNs;
-        std::size_t index;
         const Chunk *chunk;
         std::size_t slot;
     };
@@ -333,19 +364,15 @@ std::size_t FrameList::sort(std::size_t cursor) {
     places.reserve(_size);
     for (const Entry &entry : _entries)
         for (std::size_t slot = 0; slot < entry.chunk->count; ++slot)
-            places.push_back(
-                {entry.chunk->slots[slot].timestampNs, entry.firstIndex + slot, entry.chunk.get(), slot});
+            places.push_back({entry.chunk->slots[slot].timestampNs, entry.chunk.get(), slot});
     if (std::is_sorted(places.begin(), places.end(), isEarlier))
-        return cursor;
+        return;
 
     std::stable_sort(places.begin(), places.end(), isEarlier);
     FrameList sorted;
     for (const Place &place : places)
         sorted.appendCopy(*place.chunk, place.slot);
-    const auto moved = std::find_if(places.begin(), places.end(),
-                                    [cursor](const Place &place) { return place.index == cursor; });
     *this = std::move(sorted);
-    return static_cast<std::size_t>(moved - places.begin());
 }
 
 } // namespace ZorvaTouch

@@ -17,6 +17,7 @@ namespace ZorvaTouch {
 /// shares are used again, so that a bounded recording stops allocating once it has been full.
 /// Docs/Design/FrameStorage.md tells the whole story.
 ///
+/// Errors:   std::bad_alloc. A change that runs out of memory leaves the list as it was.
 /// Threads:  no lock of its own. Different lists may be used on different threads even while they share
 /// chunks. Realtime: `appendReport` allocates only when a new chunk is needed and none is left over.
 class FrameList {
@@ -38,23 +39,26 @@ public:
     [[nodiscard]] Iterator begin() const noexcept;
     [[nodiscard]] Iterator end() const noexcept;
 
-    /// Adds a frame at the end.
+    /// Adds a frame at the end, whole: a key or a value of a report is kept, as are bytes of any other kind.
     void append(Frame frame);
     /// Adds an input report at the end. `report` is copied.
     void appendReport(std::uint64_t timestampNs, std::span<const std::uint8_t> report);
+
+    /// Takes back the last call of `append` or `appendReport`. Nothing else may have happened to the list
+    /// since, not even a copy: the chunk that the frame is in may be shared then.
+    void undoAppend() noexcept;
 
     /// Keeps the newest `maxCount` frames that are no state writes, and the state writes that still matter:
     /// between two kept frames the last one of each key, and before the oldest kept frame the newest one of
     /// each key. So a replay of what is left restores every state as it was. State writes do not count
     /// against `maxCount`.
-    ///
-    /// @param cursor  A position in the list, `size()` for its end.
-    /// @return The position of the same frame afterwards, or of the next one that was kept.
-    std::size_t trim(std::uint64_t maxCount, std::size_t cursor = 0);
+    void trim(std::uint64_t maxCount);
+
+    /// How many of the frames from index `first` on `trim(maxCount)` would keep.
+    [[nodiscard]] std::size_t countKept(std::uint64_t maxCount, std::size_t first = 0) const;
 
     /// Sorts by time stamp; frames of the same time keep their order.
-    /// @return The position of the frame that was at `cursor`.
-    std::size_t sort(std::size_t cursor = 0);
+    void sort();
 
 private:
     struct Slot;
@@ -85,44 +89,68 @@ private:
         std::size_t firstIndex; ///< position of the chunk's first frame in the list
     };
 
+    using Entries = std::vector<Entry>;
+
     [[nodiscard]] static FrameView viewOf(const Chunk &chunk, std::size_t slotIndex) noexcept;
     [[nodiscard]] ChunkRef takeChunk();
-    void giveBack(ChunkRef chunk);
-    /// The chunk that the next frame goes into.
-    [[nodiscard]] Chunk &openChunk();
+    void giveBack(ChunkRef chunk) noexcept;
+    /// Adds one frame by `fill`, which puts it into a chunk or throws.
+    template <typename Fill> void appendBy(const Fill &fill);
     void appendCopy(const Chunk &chunk, std::size_t slot);
-    /// Thins a chunk to the frames with a bit in `mask`; without any, leaves it null until `renumber`.
-    void keepOnly(Entry &entry, std::uint64_t mask);
-    void renumber() noexcept;
-    void defragment();
+    /// The chunks that a trim leaves, newest first and not numbered yet.
+    [[nodiscard]] Entries thinned(std::uint64_t maxCount);
+    void replaceEntries(Entries entries) noexcept;
     void limitSpares(std::uint64_t maxCount) noexcept;
 
-    std::vector<Entry> _entries; ///< only the last one's chunk is still written to, and is never shared
+    Entries _entries; ///< only the last one's chunk is still written to, and is never shared
+    Entries _scratch; ///< empty; its capacity saves a trim the allocation
     std::vector<ChunkRef> _spares;
     std::size_t _size = 0;
 };
 
-/// Walks a list from oldest to newest. Valid until the list is changed.
+/// Walks a list from oldest to newest; several passes are allowed. Valid until the list is changed.
+///
+/// A forward iterator for ranges and their algorithms. For those of C++17, which ask a forward iterator for
+/// a reference to an element that lives in the container, it is an input iterator: views are made on the way.
 class FrameList::Iterator {
 public:
+    // NOLINTBEGIN(readability-identifier-naming): the standard library's names
+    using iterator_concept = std::forward_iterator_tag;
     using iterator_category = std::input_iterator_tag;
     using value_type = FrameView;
     using difference_type = std::ptrdiff_t;
-    using pointer = void;
     using reference = FrameView;
+    class pointer {
+    public:
+        explicit pointer(const FrameView &view) noexcept : _view(view) {}
+        [[nodiscard]] const FrameView *operator->() const noexcept { return &_view; }
 
+    private:
+        FrameView _view;
+    };
+    // NOLINTEND(readability-identifier-naming)
+
+    Iterator() noexcept = default; ///< of no list: only to be assigned to
     Iterator(const FrameList &list, std::size_t entry) noexcept : _list(&list), _entry(entry) {}
 
     [[nodiscard]] FrameView operator*() const noexcept;
+    [[nodiscard]] pointer operator->() const noexcept { return pointer(**this); }
     Iterator &operator++() noexcept;
+    Iterator operator++(int) noexcept {
+        const Iterator before = *this;
+        ++*this;
+        return before;
+    }
     friend bool operator==(const Iterator &left, const Iterator &right) noexcept {
         return left._entry == right._entry && left._slot == right._slot;
     }
 
 private:
-    const FrameList *_list;
-    std::size_t _entry;
+    const FrameList *_list = nullptr;
+    std::size_t _entry = 0;
     std::size_t _slot = 0;
 };
+
+static_assert(std::forward_iterator<FrameList::Iterator>);
 
 } // namespace ZorvaTouch

@@ -19,6 +19,19 @@ FrameList framesFromJson(std::optional<std::string_view> jsonData) {
     return readRecordingContainer(*jsonData).frames;
 }
 
+/// Where a stable sort by time takes the frame at `index`, which may be the end.
+std::size_t indexWhenSorted(const FrameList &frames, std::size_t index) noexcept {
+    if (index == frames.size())
+        return index;
+    const std::uint64_t timeNs = frames[index].timestampNs;
+    std::size_t before = 0, at = 0;
+    for (const FrameView &frame : frames) {
+        before += frame.timestampNs < timeNs || (frame.timestampNs == timeNs && at < index);
+        ++at;
+    }
+    return before;
+}
+
 } // namespace
 
 PipelineRecording::PipelineRecording(Ports::Clock &clock) : PipelineRecording(FrameList(), clock) {}
@@ -64,25 +77,40 @@ void PipelineRecording::appendFrame(Frame frame) {
 }
 
 void PipelineRecording::frameAppended() {
-    _play.valid = false;
     // Only at twice the bound, and then down to the bound: that makes trims rare.
     const bool isDue = _maxFrameCount != 0 && _frames.size() / 2 >= _maxFrameCount;
-    if (isDue)
-        trim();
+    try {
+        if (isDue)
+            _frames.trim(_maxFrameCount);
+    } catch (...) {
+        _frames.undoAppend();
+        throw;
+    }
+    _play.valid = false;
 }
 
 void PipelineRecording::setMaxFrameCount(std::uint64_t count) {
-    _maxFrameCount = count;
     if (count != 0)
-        trim();
+        trim(count);
+    _maxFrameCount = count;
 }
 
-void PipelineRecording::trim() { _play.position = _frames.trim(_maxFrameCount, _play.position); }
+void PipelineRecording::trim(std::uint64_t maxCount) {
+    const std::size_t keptFromHere = _play.valid ? _frames.countKept(maxCount, _play.position) : 0;
+    _frames.trim(maxCount);
+    _play.position = _frames.size() - keptFromHere;
+}
+
+void PipelineRecording::sort() {
+    const std::size_t position = _play.valid ? indexWhenSorted(_frames, _play.position) : 0;
+    _frames.sort();
+    _play.position = position;
+}
 
 std::string PipelineRecording::json() {
     if (_maxFrameCount != 0)
-        trim();
-    _play.position = _frames.sort(_play.position);
+        trim(_maxFrameCount);
+    sort();
     return writeRecordingContainer(_frames);
 }
 

@@ -21,6 +21,9 @@ namespace ZorvaTouch {
 /// Recording is always on; only the bound limits its memory. Recording happens before passing on, so that an
 /// input on which the pipeline fails is kept too.
 ///
+/// Errors:   std::bad_alloc where a frame is added, trimmed, sorted, copied or written. An input that cannot
+/// be
+///           recorded leaves the recording as it was and is not passed on.
 /// Threads:  no lock of its own; the caller serialises. A copy may be used on another thread.
 /// Realtime: input reports yes, once the recording has been full.
 class PipelineRecording : public PipelineInput {
@@ -59,10 +62,12 @@ public:
     void handleMetadata(std::uint64_t timestamp, const std::string &key, const PropertyValue &value) override;
 
     /// Adds a frame, trims the list down to the bound once it holds twice as many frames, and ends a
-    /// playback.
+    /// playback. The frame is kept as it is: what its kind has no use for (a key of a report) stays in the
+    /// list, and is neither passed on by a playback nor written as text.
     void appendFrame(Frame frame);
 
-    /// Sets the bound and trims to it at once; 0 means no bound. A playback goes on.
+    /// Sets the bound and trims to it at once; 0 means no bound. A playback goes on at its frame, or at the
+    /// next one that is kept.
     void setMaxFrameCount(std::uint64_t count);
     [[nodiscard]] std::uint64_t maxFrameCount() const noexcept { return _maxFrameCount; }
 
@@ -74,7 +79,7 @@ public:
     static void sortFrames(FrameList &list) { list.sort(); }
 
     /// The recording as JSON text. First trims (if there is a bound) and sorts the recording itself; that is
-    /// meant.
+    /// meant. A playback goes on at its frame.
     [[nodiscard]] std::string json();
 
     /// Turns an older container into the current version; the current one is returned unchanged.
@@ -103,7 +108,8 @@ private:
     };
 
     void frameAppended();
-    void trim();
+    void trim(std::uint64_t maxCount);
+    void sort();
     void waitForFrame(std::uint64_t timestampNs, float speed);
     void forward(const Frame &frame, std::uint64_t timestamp);
 

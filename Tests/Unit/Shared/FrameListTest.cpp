@@ -6,7 +6,9 @@
 
 #include <algorithm>
 #include <iterator>
+#include <ranges>
 #include <thread>
+#include <type_traits>
 #include <utility>
 
 // Frames are written in short hand: R7 is a report, M7 a metadata item, a=1 a write of 1 to the state "a".
@@ -27,11 +29,6 @@ std::string trimmed(const char *frames, std::uint64_t maxCount) {
     FrameList list = listFromShortHand(frames);
     list.trim(maxCount);
     return shortHand(list);
-}
-
-/// Where trimming takes the cursor.
-std::size_t cursorAfterTrim(const char *frames, std::uint64_t maxCount, std::size_t cursor) {
-    return listFromShortHand(frames).trim(maxCount, cursor);
 }
 
 /// A list of `count` one-byte reports at the times 0, 1, 2 ...; the byte is the time modulo 256.
@@ -61,9 +58,9 @@ TEST(FrameList, IsEmptyAtFirst) {
     EXPECT_TRUE(list.empty());
     EXPECT_EQ(list.size(), 0u);
     EXPECT_TRUE(list.begin() == list.end());
-    EXPECT_EQ(list.trim(5), 0u);
-    EXPECT_EQ(list.trim(0), 0u);
-    EXPECT_EQ(list.sort(), 0u);
+    list.trim(5);
+    list.trim(0);
+    list.sort();
     EXPECT_TRUE(list.empty());
 }
 
@@ -93,6 +90,21 @@ TEST(FrameList, AReportIsTheSameEitherWayItIsAdded) {
         byBytes.appendReport(5, bytes);
         EXPECT_EQ(framesOf(byFrame), framesOf(byBytes)) << length;
         EXPECT_EQ(framesOf(byBytes).at(0), reportFrame(5, bytes)) << length;
+    }
+}
+
+TEST(FrameList, KeepsWhatAFramesKindHasNoUseFor) {
+    // The same for a report that would fit a slot and for one that does not.
+    for (const std::size_t length : {1u, 76u, 77u, 600u}) {
+        const auto bytes = patternedReport(length, 1);
+        const std::vector<Frame> frames{{FrameType::InputReport, 5, "key", {}, bytes},
+                                        {FrameType::InputReport, 6, "", 7u, bytes},
+                                        {FrameType::InputReport, 7, "key", "value", bytes},
+                                        {FrameType::State, 8, "key", 7u, bytes}};
+        FrameList list;
+        for (const Frame &frame : frames)
+            list.append(frame);
+        EXPECT_EQ(framesOf(list), frames) << length;
     }
 }
 
@@ -207,7 +219,8 @@ TEST(FrameList, AListOfStateWritesShrinksToOneOfEach) {
     FrameList list;
     for (std::uint64_t i = 0; i < 1000; ++i)
         list.append(stateFrame(i, i % 2 ? "odd" : "even", i));
-    EXPECT_EQ(list.trim(7, 500), 0u);
+    EXPECT_EQ(list.countKept(7, 500), 2u);
+    list.trim(7);
     EXPECT_EQ(framesOf(list),
               (std::vector<Frame>{stateFrame(998, "even", 998u), stateFrame(999, "odd", 999u)}));
 }
@@ -292,7 +305,7 @@ TEST(FrameList, ThinlySpreadStatesSurviveAndStaySharedWithCopies) {
             list.appendReport(i, patternedReport(73, static_cast<std::uint8_t>(j)));
     }
     const FrameList whole(list);
-    EXPECT_EQ(list.trim(1, 71 * 50), 50u) << "the write of key 50";
+    list.trim(1);
     std::vector<Frame> expected = states;
     expected.push_back(reportFrame(99, patternedReport(73, 69)));
     EXPECT_EQ(framesOf(list), expected);
@@ -325,49 +338,97 @@ TEST(FrameList, ABoundedListStaysWhatItIsOverManyRounds) {
     EXPECT_EQ(list[109].toFrame(), reportFrame(19999, patternedReport(99, static_cast<std::uint8_t>(19999))));
 }
 
-// --- Cursors -------------------------------------------------------------------------------------
+// --- What a trim would keep ----------------------------------------------------------------------
 
-TEST(FrameList, TrimTellsWhereTheFrameWent) {
-    // Kept of R1 a=1 R2 a=2 a=3 R3 R4 are a=3 R3 R4, once at 4, 5 and 6.
-    const char *frames = "R1 a=1 R2 a=2 a=3 R3 R4";
-    EXPECT_EQ(cursorAfterTrim(frames, 2, 4), 0u);
-    EXPECT_EQ(cursorAfterTrim(frames, 2, 5), 1u);
-    EXPECT_EQ(cursorAfterTrim(frames, 2, 6), 2u);
-    EXPECT_EQ(cursorAfterTrim(frames, 2, 7), 3u) << "the end stays the end";
+TEST(FrameList, CountsWhatATrimWouldKeepAndChangesNothing) {
+    // Kept of R1 a=1 R2 a=2 a=3 R3 R4 are a=3 R3 R4, at 4, 5 and 6.
+    const FrameList list = listFromShortHand("R1 a=1 R2 a=2 a=3 R3 R4");
+    EXPECT_EQ(list.countKept(2), 3u);
+    for (const std::size_t first : {0u, 1u, 2u, 3u, 4u})
+        EXPECT_EQ(list.countKept(2, first), 3u) << first;
+    EXPECT_EQ(list.countKept(2, 5), 2u);
+    EXPECT_EQ(list.countKept(2, 6), 1u);
+    EXPECT_EQ(list.countKept(2, 7), 0u);
+    EXPECT_EQ(list.countKept(100), 6u) << "a=3 overwrites a=2 before any report";
+    EXPECT_EQ(list.countKept(0), 1u) << "the last write";
+    EXPECT_EQ(shortHand(list), "R1 a=1 R2 a=2 a=3 R3 R4");
+    EXPECT_EQ(FrameList().countKept(5), 0u);
 }
 
-TEST(FrameList, TrimMovesACursorToTheNextKeptFrame) {
-    const char *frames = "R1 a=1 R2 a=2 a=3 R3 R4";
-    for (const std::size_t removed : {0u, 1u, 2u, 3u})
-        EXPECT_EQ(cursorAfterTrim(frames, 2, removed), 0u) << removed;
-    EXPECT_EQ(cursorAfterTrim("a=1 R1 b=1 R2 a=2", 1, 1), 1u) << "R1 goes, b=1 is next; a=1 stays before it";
-    EXPECT_EQ(cursorAfterTrim("b=1 R1", 0, 1), 1u) << "nothing is kept after R1: the end";
+TEST(FrameList, CountsWhatATrimWouldKeepAcrossChunks) {
+    const FrameList list = numberedReports(1000);
+    EXPECT_EQ(list.countKept(500, 499), 500u);
+    EXPECT_EQ(list.countKept(500, 500), 500u);
+    EXPECT_EQ(list.countKept(500, 501), 499u);
+    EXPECT_EQ(list.countKept(500, 999), 1u);
+    EXPECT_EQ(list.countKept(500, 1000), 0u);
+    EXPECT_EQ(list.countKept(2000, 777), 223u);
+    EXPECT_EQ(list.countKept(2000, 0), 1000u);
 }
 
-TEST(FrameList, TrimMovesACursorAcrossChunks) {
-    FrameList list = numberedReports(1000);
-    EXPECT_EQ(list.trim(500, 499), 0u);
-    list = numberedReports(1000);
-    EXPECT_EQ(list.trim(500, 500), 0u);
-    list = numberedReports(1000);
-    EXPECT_EQ(list.trim(500, 501), 1u);
-    list = numberedReports(1000);
-    EXPECT_EQ(list.trim(500, 999), 499u);
-    list = numberedReports(1000);
-    EXPECT_EQ(list.trim(500, 1000), 500u);
-    list = numberedReports(1000);
-    EXPECT_EQ(list.trim(2000, 777), 777u);
+// --- Undoing an append ---------------------------------------------------------------------------
+
+TEST(FrameList, AnAppendCanBeTakenBack) {
+    for (const std::size_t count : {0u, 1u, 63u, 64u, 65u, 128u}) {
+        FrameList list = numberedReports(count);
+        list.appendReport(1000, std::vector<std::uint8_t>{1});
+        list.undoAppend();
+        expectNumberedReports(list, 0, count);
+        list.append(stateFrame(1000, "a", "text"));
+        list.undoAppend();
+        expectNumberedReports(list, 0, count);
+        EXPECT_EQ(list.countKept(0), 0u) << "the state write is not counted any more";
+        list.appendReport(count, std::vector<std::uint8_t>{static_cast<std::uint8_t>(count)});
+        expectNumberedReports(list, 0, count + 1);
+    }
 }
 
-TEST(FrameList, SortTellsWhereTheFrameWent) {
-    const auto sorted = [](std::size_t cursor) {
-        return listFromShortHand("R1@30 R2@10 R3@20 R4@10").sort(cursor); // R2 R4 R3 R1
-    };
-    EXPECT_EQ(sorted(0), 3u);
-    EXPECT_EQ(sorted(1), 0u);
-    EXPECT_EQ(sorted(2), 2u);
-    EXPECT_EQ(sorted(3), 1u);
-    EXPECT_EQ(sorted(4), 4u) << "the end stays the end";
+TEST(FrameList, AnAppendTakenBackLeavesCopiesAlone) {
+    FrameList list = numberedReports(64);
+    const FrameList copy(list);
+    list.append(metadataFrame(64, "m", 1u));
+    list.undoAppend();
+    list.appendReport(64, std::vector<std::uint8_t>{64});
+    expectNumberedReports(copy, 0, 64);
+    expectNumberedReports(list, 0, 65);
+}
+
+// --- Walking -------------------------------------------------------------------------------------
+
+static_assert(std::forward_iterator<FrameList::Iterator>);
+static_assert(std::ranges::forward_range<const FrameList> && std::ranges::sized_range<const FrameList>);
+static_assert(!std::random_access_iterator<FrameList::Iterator>);
+static_assert(
+    std::is_same_v<std::iterator_traits<FrameList::Iterator>::iterator_category, std::input_iterator_tag>);
+
+TEST(FrameList, IteratorsWalkTheListMoreThanOnce) {
+    const FrameList list = numberedReports(65);
+    FrameList::Iterator left = list.begin();
+    const FrameList::Iterator right = left++;
+    EXPECT_TRUE(right == list.begin());
+    EXPECT_EQ(right->timestampNs, 0u);
+    EXPECT_EQ(left->timestampNs, 1u);
+    EXPECT_EQ(std::next(right, 64)->timestampNs, 64u) << "in the second chunk";
+    EXPECT_EQ(std::ranges::distance(right, list.end()), 65);
+    EXPECT_EQ(right->timestampNs, 0u) << "a pass leaves other iterators where they are";
+    left = FrameList::Iterator();
+    EXPECT_TRUE(left == FrameList::Iterator());
+}
+
+TEST(FrameList, RangesAndAlgorithmsTakeAList) {
+    const FrameList list = listFromShortHand("R1@10 a=1@20 M3@20 R4@30");
+    const auto isReport = [](const FrameView &frame) { return frame.type == FrameType::InputReport; };
+    EXPECT_EQ(std::ranges::count_if(list, isReport), 2);
+    EXPECT_EQ(std::count_if(list.begin(), list.end(), isReport), 2);
+    EXPECT_EQ(std::ranges::find(list, 20u, &FrameView::timestampNs)->key, "a");
+    EXPECT_EQ(std::ranges::adjacent_find(list, {}, &FrameView::timestampNs)->key, "a");
+    EXPECT_TRUE(std::ranges::is_sorted(list, {}, &FrameView::timestampNs));
+    EXPECT_EQ(std::ranges::max_element(list, {}, &FrameView::timestampNs)->data[0], 4);
+    std::vector<std::uint64_t> times;
+    const auto timeOf = [](const FrameView &frame) { return frame.timestampNs; };
+    for (const std::uint64_t time : list | std::views::filter(isReport) | std::views::transform(timeOf))
+        times.push_back(time);
+    EXPECT_EQ(times, (std::vector<std::uint64_t>{10, 30}));
 }
 
 // --- Sorting -------------------------------------------------------------------------------------
@@ -390,7 +451,7 @@ TEST(FrameList, SortTurnsALongListAround) {
         const std::size_t time = 999 - i;
         list.appendReport(time, std::vector<std::uint8_t>{static_cast<std::uint8_t>(time)});
     }
-    EXPECT_EQ(list.sort(0), 999u);
+    list.sort();
     expectNumberedReports(list, 0, 1000);
 }
 
@@ -401,7 +462,7 @@ TEST(FrameList, SortKeepsALongListOfOneTimeInOrder) {
         frames.push_back(reportFrame(5, {i}));
         list.append(frames.back());
     }
-    EXPECT_EQ(list.sort(123), 123u);
+    list.sort();
     EXPECT_EQ(framesOf(list), frames);
 }
 
@@ -579,8 +640,8 @@ TEST(FrameList, AMovedFromListIsEmptyAndOfUse) {
         EXPECT_EQ(framesOf(target), frames);
         EXPECT_TRUE(list.empty()); // NOLINT(bugprone-use-after-move): that is what is tested
         EXPECT_TRUE(list.begin() == list.end());
-        EXPECT_EQ(list.trim(1), 0u);
-        EXPECT_EQ(list.sort(), 0u);
+        list.trim(1);
+        list.sort();
         list.append(reportFrame(9, {9}));
         EXPECT_EQ(shortHand(list), "R9");
 

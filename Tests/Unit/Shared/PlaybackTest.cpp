@@ -382,6 +382,41 @@ TEST_F(Playback, SettingNoBoundChangesNothing) {
     EXPECT_EQ(takePlayed(), "R1 R2");
 }
 
+TEST_F(Playback, FindsItsFrameAmongEqualTimesWhenTheTextSortsTheList) {
+    append("R1@2 R2@1 R3@2 R4@1 R5@2");
+    struct Row {
+        int played;
+        const char *rest;
+    };
+    constexpr Row kRows[] = {
+        {0, "R1 R3 R5"}, {1, "R2 R4 R1 R3 R5"}, {2, "R3 R5"}, {3, "R4 R1 R3 R5"}, {4, "R5"}, {5, ""}};
+    for (const auto &[played, rest] : kRows) {
+        PipelineRecording copy(recording);
+        copy.playReset();
+        for (int i = 0; i < played; ++i)
+            copy.playNextFrame(1.0f);
+        (void)takePlayed();
+        (void)copy.json(); // R2 R4 R1 R3 R5
+        while (copy.playCanContinue())
+            copy.playNextFrame(1.0f);
+        EXPECT_EQ(takePlayed(), rest) << played;
+    }
+}
+
+TEST_F(Playback, PassesOnAReportWithoutAKeyOrAValueThatItWasGiven) {
+    for (const std::size_t length : {1u, 76u, 77u}) {
+        const auto bytes = Scripted::patternedReport(length, 1);
+        recording = PipelineRecording(clock);
+        recording.pipeline = input;
+        recording.appendFrame({FrameType::InputReport, 0, "key", "value", bytes});
+        playAll(1.0f);
+        EXPECT_EQ(input->calls.back(), (Call{FrameType::InputReport, 0, {}, {}, bytes})) << length;
+        const auto written = PipelineRecording(recording.json(), clock);
+        EXPECT_EQ(Scripted::framesOf(written.frames()), (std::vector<Frame>{reportFrame(0, bytes)}))
+            << length;
+    }
+}
+
 TEST_F(Playback, StaysAtItsFrameWhenTheTextSortsTheList) {
     append("R1@3000 R2@1000 R3@2000");
     clock.ticks = 100;
