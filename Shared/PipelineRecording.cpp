@@ -130,11 +130,14 @@ bool PipelineRecording::playCanContinue() const noexcept {
 void PipelineRecording::playNextFrame(float speed) {
     if (!playCanContinue())
         throw std::runtime_error("playback finished");
-    const Frame frame =
-        _frames[_play.position++].toFrame(); // a copy: the pipeline may record into this very list
-    const std::uint64_t offsetNs = frame.timestampNs - (*_frames.begin()).timestampNs;
+    // A copy: the pipeline may record into this very list.
+    const Frame frame = _frames[_play.position].toFrame();
+    ++_play.position;
     waitForFrame(frame.timestampNs, speed);
     _play.lastFrameTimeNs = frame.timestampNs;
+    // The head as it is after the pause, in which the list may have changed.
+    const std::uint64_t headNs = _frames.empty() ? frame.timestampNs : _frames.begin()->timestampNs;
+    const std::uint64_t offsetNs = frame.timestampNs - headNs;
     forward(frame, _play.startTimeMach + _ticks.machTimeFromNanoseconds(offsetNs));
 }
 

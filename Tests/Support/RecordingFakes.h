@@ -23,7 +23,11 @@ class FakeClock final : public Ports::Clock {
 public:
     [[nodiscard]] std::uint64_t nowTicks() noexcept override { return ticks; }
     [[nodiscard]] Ports::TimeBase timeBase() noexcept override { return base; }
-    void sleepMicroseconds(std::uint64_t durationUs) noexcept override { sleeps.push_back(durationUs); }
+    void sleepMicroseconds(std::uint64_t durationUs) noexcept override {
+        sleeps.push_back(durationUs);
+        if (duringSleep)
+            duringSleep();
+    }
 
     /// The sleeps that take time at all: whether a pause of 0 is made or left out does not matter.
     [[nodiscard]] std::vector<std::uint64_t> pausesUs() const;
@@ -31,6 +35,7 @@ public:
     std::uint64_t ticks = 0;
     Ports::TimeBase base{1, 1};
     std::vector<std::uint64_t> sleeps; ///< every sleep, in microseconds
+    std::function<void()> duringSleep; ///< must not throw
 };
 
 /// One record of a log.

@@ -54,6 +54,16 @@ protected:
         return shortHand(frames);
     }
 
+    /// The same with the time stamps, as "R1@100".
+    std::string takePlayedAt() {
+        std::string text;
+        for (const Call &call : input->calls)
+            text += (text.empty() ? "" : " ") + shortHand({{call.type, 0, call.key, call.value, call.data}}) +
+                    "@" + std::to_string(call.timestamp);
+        input->calls.clear();
+        return text;
+    }
+
     void expectFinished() {
         EXPECT_FALSE(recording.playCanContinue());
         try {
@@ -380,6 +390,36 @@ TEST_F(Playback, SettingNoBoundChangesNothing) {
     recording.setMaxFrameCount(0);
     recording.playNextFrame(1.0f);
     EXPECT_EQ(takePlayed(), "R1 R2");
+}
+
+TEST_F(Playback, MeasuresTimesFromTheHeadAsItIsAfterThePause) {
+    append("R1@1000 R2@2000 R3@3000 R4@4000");
+    clock.ticks = 100;
+    recording.playReset();
+    recording.playNextFrame(1.0f);
+    clock.duringSleep = [this] { recording.setMaxFrameCount(3); }; // R1 goes, R2 is the head
+    recording.playNextFrame(1.0f);
+    clock.duringSleep = [this] { recording.setMaxFrameCount(2); }; // R2 goes, R3 is the head
+    recording.playNextFrame(1.0f);
+    clock.duringSleep = nullptr;
+    recording.playNextFrame(1.0f);
+    EXPECT_EQ(takePlayedAt(), "R1@100 R2@100 R3@100 R4@1100");
+    expectFinished();
+}
+
+TEST_F(Playback, PlaysTheFrameInItsHandsWhenThePauseEmptiesTheList) {
+    append("R1@1000 R2@2000");
+    clock.ticks = 100;
+    recording.playReset();
+    recording.playNextFrame(1.0f);
+    clock.duringSleep = [this] {
+        recording = PipelineRecording(clock);
+        recording.pipeline = input;
+    };
+    recording.playNextFrame(1.0f);
+    EXPECT_EQ(shortHand(recording.frames()), "");
+    ASSERT_EQ(input->calls.size(), 2u);
+    EXPECT_EQ(input->calls[1].data, std::vector<std::uint8_t>{2});
 }
 
 TEST_F(Playback, FindsItsFrameAmongEqualTimesWhenTheTextSortsTheList) {
