@@ -11,9 +11,9 @@ namespace {
 
 using namespace ZorvaTouch;
 
-void reportFailure(Host::Platform &platform, const char *reason) noexcept {
+void reportFailure(const char *reason) noexcept {
     try {
-        ServiceLog(platform.logs().openLog(kLogSubsystem, kLogCategoryService))
+        ServiceLog(Host::processPlatform().logs().openLog(kLogSubsystem, kLogCategoryService))
             .error("factory failed: {}", reason);
     } catch (...) { // no memory even for a log: the null pointer must do
     }
@@ -25,14 +25,13 @@ extern "C" __attribute__((visibility("default"))) void *ZorvaTouchHIDServiceFact
                                                                                     ZorvaUuid type) noexcept {
     if (std::memcmp(&type, &kZorvaHidServicePlugInType, sizeof type) != 0)
         return nullptr;
-    Host::Platform &platform = Host::processPlatform();
     try {
         // The one reference that it begins with is the host's.
-        return (new ZorvaTouchHIDService(platform))->getPluginInterface();
+        return (new ZorvaTouchHIDService(Host::processPlatform()))->getPluginInterface();
     } catch (const std::exception &error) {
-        reportFailure(platform, error.what());
+        reportFailure(error.what());
     } catch (...) {
-        reportFailure(platform, "unknown exception");
+        reportFailure("unknown exception");
     }
     return nullptr;
 }

@@ -82,7 +82,8 @@ public:
 };
 
 /// The process's platform: the system's own unless the host put another in its place.
-[[nodiscard]] Platform &processPlatform() noexcept;
+/// @throws std::bad_alloc  The system's own is made when it is first asked for.
+[[nodiscard]] Platform &processPlatform();
 
 /// Puts a platform in the place of the system's own; null brings that back. For hosts, before they load a
 /// plug-in: who has taken the old one keeps it.

@@ -21,8 +21,9 @@ AsioRunLoop::AsioRunLoop(std::shared_ptr<Ports::Log> log)
     : BoundaryObject(&Table::kTable), _log(std::move(log)) {}
 
 AsioRunLoop::~AsioRunLoop() {
+    // Nothing here allocates: a loop is also destroyed when there was no memory to finish making it.
     Sources sources;
-    std::deque<Closure> closures;
+    std::list<Closure> closures;
     {
         const MutexLock lock(_mutex);
         sources.swap(_sources);
@@ -197,9 +198,10 @@ void AsioRunLoop::enqueue(std::string_view mode, Job &job) {
 
 std::uint64_t AsioRunLoop::add(const std::shared_ptr<Source> &source) {
     const MutexLock lock(_mutex);
-    _sources.push_back(source);
-    source->number = ++_lastNumber;
+    _sources.reserve(_sources.size() + 1); // a source is listed when nothing can fail any more
     wait(source);
+    source->number = ++_lastNumber;
+    _sources.push_back(source);
     wake();
     return source->number;
 }

@@ -14,7 +14,7 @@
 #include <atomic>
 #include <cstddef>
 #include <cstdint>
-#include <deque>
+#include <list>
 #include <memory>
 #include <optional>
 #include <string>
@@ -99,7 +99,7 @@ private:
     Mutex _mutex;
     bool _isStopAsked ZORVA_GUARDED_BY(_mutex) = false;
     Sources _sources ZORVA_GUARDED_BY(_mutex);
-    std::deque<Closure> _closures ZORVA_GUARDED_BY(_mutex);
+    std::list<Closure> _closures ZORVA_GUARDED_BY(_mutex); ///< an empty one has no memory: see the destructor
     std::atomic<bool> _hasClosures{
         false}; ///< changed under the lock; a look without it saves most passes one
     std::uint64_t _lastNumber ZORVA_GUARDED_BY(_mutex) = 0;

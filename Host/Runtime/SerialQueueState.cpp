@@ -5,9 +5,10 @@
 
 #include <asio/post.hpp>
 
+#include <cstring>
 #include <exception>
 #include <memory>
-#include <system_error>
+#include <string>
 #include <utility>
 
 namespace ZorvaTouch::Host {
@@ -60,7 +61,7 @@ void SerialQueue::State::takePriority(int roundRobinPriority) {
     if (roundRobinPriority == 0)
         return;
     if (const int errorNumber = setRoundRobinPriorityOfThisThread(roundRobinPriority))
-        logError("no real-time priority: " + std::generic_category().message(errorNumber));
+        logError("no real-time priority: ", ::strerrordesc_np(errorNumber));
 }
 
 void SerialQueue::State::run(Job &job) noexcept {
@@ -69,7 +70,7 @@ void SerialQueue::State::run(Job &job) noexcept {
     try {
         job.run();
     } catch (const std::exception &failure) {
-        logError(std::string("a function has failed: ") + failure.what());
+        logError("a function has failed: ", failure.what());
     } catch (...) {
         logError("a function has failed");
     }
@@ -87,9 +88,11 @@ void SerialQueue::State::discardRest() {
     _io.poll();
 }
 
-void SerialQueue::State::logError(const std::string &text) noexcept {
+void SerialQueue::State::logError(std::string_view text, const char *reason) noexcept {
     try {
-        _log->write(Ports::LogLevel::Error, _name + ": " + text);
+        std::string line = _name + ": ";
+        line.append(text).append(reason ? reason : "");
+        _log->write(Ports::LogLevel::Error, line);
     } catch (...) { // no memory for the line
     }
 }

@@ -11,6 +11,7 @@
 
 #include <memory>
 #include <string>
+#include <string_view>
 
 namespace ZorvaTouch::Host {
 
@@ -29,7 +30,8 @@ public:
     void serve(int roundRobinPriority);
     void end() noexcept;
 
-    void logError(const std::string &text) noexcept;
+    /// @param reason  Follows the text; may be null.
+    void logError(std::string_view text, const char *reason = nullptr) noexcept;
 
 private:
     friend BoundaryObject;

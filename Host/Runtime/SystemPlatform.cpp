@@ -62,7 +62,7 @@ int SystemPlatform::setRoundRobinPriority(int priority) noexcept {
     return setRoundRobinPriorityOfThisThread(priority);
 }
 
-Platform &processPlatform() noexcept {
+Platform &processPlatform() {
     if (Platform *const platform = platformOfTheHost.load(std::memory_order_acquire))
         return *platform;
     // Made when it is first asked for; gone when the library is unloaded or the process ends.
