@@ -125,7 +125,7 @@ public:
                       observer);
                   return _device;
               },
-              nullptr, [](const std::string &) {}) {}
+              _keyboard, nullptr, [](const std::string &) {}) {}
 
     void watch(KeyJourney *journey) override { _end.journey = journey; }
     void advanceTo(std::size_t report) override {

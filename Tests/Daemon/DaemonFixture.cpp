@@ -51,7 +51,10 @@ TemporaryFolder::~TemporaryFolder() {
 
 // --- The daemon --------------------------------------------------------------------------------------------
 
-DaemonFixture::DaemonFixture() { options.showsEvents = true; }
+DaemonFixture::DaemonFixture() {
+    options.showsEvents = true;
+    options.sendsSimulatedKeys = true; // fingers are the only surfaces of most tests
+}
 
 DaemonFixture::~DaemonFixture() {
     finish();

@@ -102,6 +102,14 @@ TEST_F(DaemonTest, WithoutAKeyboardKeysAreTold) {
               1u);
 }
 
+TEST_F(DaemonTest, ASimulatedSurfaceShowsItsKeysUnlessAskedToPressThem) {
+    options.sendsSimulatedKeys = false;
+    addFinger("taps", 0.95);
+    runToTheEnd();
+    EXPECT_THAT(keys.journal.lines(), IsEmpty());
+    EXPECT_THAT(linesWith("\"sent\":false"), SizeIs(2));
+}
+
 TEST_F(DaemonTest, KeysThatAreOnlyShownAskForNoKeyboard) {
     options.sendsKeys = false;
     addFinger("taps", 0.95);

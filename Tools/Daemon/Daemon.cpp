@@ -45,8 +45,9 @@ Daemon::Daemon(const DaemonOptions &options, DaemonSurroundings surroundings)
           [isJson = options.showsEvents](std::uint64_t lines) { return droppedLine(isJson, lines); },
           _logs->openLog(kLogSubsystem, "Events")),
       _listener(makeListener()), _keyQueue("zorva-keys", realTimePriority()),
-      _keyboard(options.sendsKeys ? _surroundings.keyboard : nullptr, *_listener, DaemonLog(*_logs, "Keys")),
-      _events(Host::EventSystem::create()),
+      _keyboard(pressesKeys(options) ? _surroundings.keyboard : nullptr, *_listener,
+                DaemonLog(*_logs, "Keys")),
+      _shownKeys(nullptr, *_listener, DaemonLog(*_logs, "Keys")), _events(Host::EventSystem::create()),
       _recordings(options.saveFile, *_listener, DaemonLog(*_logs, "Recordings")),
       _signals(kSignals, [this](int signal) { handleSignal(signal); }),
       _surfaces({.plugIn = _plugIn,
@@ -213,14 +214,21 @@ void Daemon::watchSleep() {
     _sleepWatch.emplace(
         _loop, *_logs,
         [this] {
-            _keyQueue.submit([this] { _keyboard.sleep(true); });
+            sleepKeyboards(true);
             _surfaces.suspend();
             _listener->onSleep(true);
         },
         [this] {
-            _keyQueue.submit([this] { _keyboard.sleep(false); });
+            sleepKeyboards(false);
             _listener->onSleep(false);
         });
+}
+
+void Daemon::sleepKeyboards(bool begins) {
+    _keyQueue.submit([this, begins] {
+        _keyboard.sleep(begins);
+        _shownKeys.sleep(begins);
+    });
 }
 
 void Daemon::flushLogsWhenDue() {
@@ -238,7 +246,8 @@ void Daemon::startSimulations() {
         if (const auto *const finger = std::get_if<SimulatedFinger>(&device)) {
             SimulatedSurface &simulation =
                 _simulations.emplace_back(*finger, hasAccelerometer, _loop, [this] { finishSimulation(); });
-            _surfaces.add(simulation.name(), simulation.maker(), simulation.events());
+            _surfaces.add(simulation.name(), simulation.maker(),
+                          _options.sendsSimulatedKeys ? _keyboard : _shownKeys, simulation.events());
             simulation.play();
             ++_playing;
         }

@@ -82,6 +82,7 @@ private:
     void requireOwnSurfaces() const;
     void logMissingDevices(const Linux::DeviceFilter &filter);
     void watchSleep();
+    void sleepKeyboards(bool begins);
 
     void withAccelMonitor(const std::function<void()> &use);
     void noteAccelerometer();
@@ -103,6 +104,7 @@ private:
     const std::unique_ptr<DaemonListener> _listener;
     Host::SerialQueue _keyQueue;
     Keyboard _keyboard;
+    Keyboard _shownKeys; ///< of surfaces whose keys are only shown
     const std::shared_ptr<Host::EventSystem> _events;
     RecordingKeeper _recordings;
     EndRequests _endRequests; ///< the signal thread's

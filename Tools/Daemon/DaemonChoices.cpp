@@ -2,6 +2,7 @@
 
 #include "Host/Linux/DeviceMonitor.h"
 
+#include <algorithm>
 #include <stdexcept>
 #include <string>
 #include <variant>
@@ -22,6 +23,14 @@ void requireNodes(const Linux::DeviceFilter &filter) {
     for (const std::string &node : filter.nodes)
         if (Linux::nodeKindOf(node) == Linux::NodeKind::Other)
             throw std::runtime_error(node + ": must be a hidraw device node, as /dev/hidraw0 is");
+}
+
+bool pressesKeys(const DaemonOptions &options) {
+    const auto isNode = [](const DeviceOption &device) {
+        return std::holds_alternative<std::string>(device);
+    };
+    const bool hasRealSurfaces = options.devices.empty() || std::ranges::any_of(options.devices, isNode);
+    return options.sendsKeys && (hasRealSurfaces || options.sendsSimulatedKeys);
 }
 
 Linux::AccelChoice accelChoiceOf(const AccelOption &option) {

@@ -15,6 +15,9 @@ namespace ZorvaTouch::Tools {
 /// path.
 void requireNodes(const Linux::DeviceFilter &filter);
 
+/// Whether any surface presses keys: a real one, unless `--no-keys`, or a simulated one with `--keys`.
+[[nodiscard]] bool pressesKeys(const DaemonOptions &options);
+
 [[nodiscard]] Linux::AccelChoice accelChoiceOf(const AccelOption &option);
 
 } // namespace ZorvaTouch::Tools

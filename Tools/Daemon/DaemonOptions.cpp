@@ -27,7 +27,7 @@ constexpr const char *kFooter = R"(
 Examples:
   zorvatouchd
   zorvatouchd --no-keys
-  zorvatouchd --device sim:day --no-keys --duration 20
+  zorvatouchd --device sim:day --duration 20
   zorvatouchd --id 1234:ABCD --id 1234:ABCF
   zorvatouchd --map hold:play-pause=KEY_MICMUTE --map tap:volume-up=none
   zorvatouchd --events json --save touch.json
@@ -204,6 +204,7 @@ private:
                    "REGION        play-pause, volume-down, volume-up\n"
                    "KEY           the kernel's name of it, as KEY_NEXTSONG; or none");
         addFlag(kGroup, "--no-keys", _noKeys, "Show the keys instead of pressing them");
+        addFlag(kGroup, "--keys", _keys, "Press the keys of simulated surfaces, too (default: show them)");
     }
 
     void declareOutput() {
@@ -304,8 +305,11 @@ private:
         if (_events && *_events != "json")
             refuse("--events", *_events, "no format; there is json");
         options.showsEvents = _events.has_value();
+        if (_keys && _noKeys)
+            throw CliError("--keys and --no-keys exclude each other");
         options.sendsKeys = !_noKeys;
         options.waits = _wait;
+        options.sendsSimulatedKeys = _keys;
         options.describe = _describe;
         if (_save)
             requireFileName("--save", *_save);
@@ -322,6 +326,7 @@ private:
             {"--events", _events.has_value()},
             {"--save", _save.has_value()},
             {"--no-keys", _noKeys},
+            {"--keys", _keys},
             {"--duration", _duration.has_value()},
             {"--wait", _wait},
         };
@@ -334,7 +339,7 @@ private:
     // As typed.
     std::vector<std::string> _devices, _ids, _maps;
     std::optional<std::string> _seed, _duration, _accel, _events, _save, _logLevel, _plugIn;
-    bool _noKeys = false, _describe = false, _wait = false;
+    bool _keys = false, _noKeys = false, _describe = false, _wait = false;
 };
 
 } // namespace

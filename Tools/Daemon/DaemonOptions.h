@@ -36,10 +36,11 @@ struct DaemonOptions {
     std::vector<Linux::HidId> ids{{0x1234, 0xABCD}}; ///< which makes it looks for
     AccelOption accel;
     KeyMap keys;
-    bool sendsKeys = true;    ///< or shows them
-    bool showsEvents = false; ///< as lines of JSON
-    bool waits = false;       ///< for surfaces that another program uses, rather than ending
-    bool describe = false;    ///< says what is there, and that is all
+    bool sendsKeys = true;           ///< of real surfaces; shows them if false
+    bool sendsSimulatedKeys = false; ///< the same for simulated surfaces; needs `sendsKeys`
+    bool showsEvents = false;        ///< as lines of JSON
+    bool waits = false;              ///< for surfaces that another program uses, rather than ending
+    bool describe = false;           ///< says what is there, and that is all
     std::optional<std::string> saveFile;
     Ports::LogLevel logLevel = Ports::LogLevel::Default;
     std::optional<std::string> plugIn; ///< nothing: the one beside the program

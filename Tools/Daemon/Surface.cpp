@@ -20,9 +20,9 @@ std::string_view adviceFor(const Linux::SystemFailure &failure) noexcept {
 } // namespace
 
 Surface::Surface(SurfaceSurroundings &surroundings, const SurfaceName &name, const DeviceMaker &maker,
-                 const std::shared_ptr<Host::EventSystem> &events,
+                 Keyboard &keyboard, const std::shared_ptr<Host::EventSystem> &events,
                  std::function<void(const std::string &)> onLost)
-    : _surroundings(surroundings), _name(name),
+    : _surroundings(surroundings), _name(name), _keyboard(keyboard),
       _observer(std::make_shared<Observer>(surroundings, std::move(onLost), [this] { watchSilence(); })),
       _service(surroundings.plugIn) {
     try {
@@ -50,8 +50,7 @@ void Surface::stop() {
 }
 
 void Surface::schedule() {
-    _keys = std::make_shared<SurfaceKeys>(_name, _surroundings.keyMap, _surroundings.keyboard,
-                                          _surroundings.listener,
+    _keys = std::make_shared<SurfaceKeys>(_name, _surroundings.keyMap, _keyboard, _surroundings.listener,
                                           [observer = _observer] { observer->tellHeld(); });
     _observer->begin(_keys);
     _service->setEventCallback(SurfaceKeys::receive, _keys.get());

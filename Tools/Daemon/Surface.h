@@ -25,7 +25,7 @@ struct SurfaceSurroundings {
     std::shared_ptr<const Host::PlugInFile> plugIn;
     std::shared_ptr<Host::EventSystem> events; ///< of surfaces without an accelerometer of their own
     Host::SerialQueue &keyQueue;
-    Keyboard &keyboard;
+    Keyboard &keyboard; ///< of surfaces that the system reports
     KeyMap keyMap;
     DaemonListener &listener;
     Linux::MainLoop &loop;
@@ -56,6 +56,7 @@ public:
     static constexpr std::chrono::milliseconds kLongestSilence{900};
 
     /// Opens the device and begins to listen.
+    /// @param keyboard  Receives its keys. Borrowed.
     /// @param events  Where its accelerometer is.
     /// @param onLost  Called on the main thread, once at most, when the surface no longer works, with the
     ///                reason; not from within this object's functions.
@@ -63,7 +64,7 @@ public:
     /// @throws std::runtime_error  It cannot be opened, with the reason in one line.
     /// @throws std::bad_alloc
     Surface(SurfaceSurroundings &surroundings, const SurfaceName &name, const DeviceMaker &maker,
-            const std::shared_ptr<Host::EventSystem> &events,
+            Keyboard &keyboard, const std::shared_ptr<Host::EventSystem> &events,
             std::function<void(const std::string &reason)> onLost);
     /// Closes the device, with everything that came before carried out and every key up.
     ~Surface();
@@ -94,6 +95,7 @@ private:
 
     SurfaceSurroundings &_surroundings;
     const SurfaceName _name;
+    Keyboard &_keyboard;
     const std::shared_ptr<Observer> _observer;
     std::shared_ptr<SurfaceKeys> _keys; ///< of the last schedule
     std::optional<HostedService> _service;

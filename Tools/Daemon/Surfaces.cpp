@@ -27,15 +27,18 @@ void Surfaces::onAdded(const Linux::DeviceIdentity &device) {
     add({.name = nameOf(device),
          .syspath = device.syspath,
          .maker = _finder(device),
+         .keyboard = _surroundings.keyboard,
          .events = _surroundings.events});
 }
 
-void Surfaces::add(const SurfaceName &name, DeviceMaker maker, std::shared_ptr<Host::EventSystem> events) {
+void Surfaces::add(const SurfaceName &name, DeviceMaker maker, Keyboard &keyboard,
+                   std::shared_ptr<Host::EventSystem> events) {
     SurfaceName own = name;
     makeUnique(own.id);
     add({.name = std::move(own),
          .syspath = {},
          .maker = std::move(maker),
+         .keyboard = keyboard,
          .events = events ? std::move(events) : _surroundings.events});
 }
 
@@ -68,7 +71,7 @@ void Surfaces::open(Entry &entry) {
     entry.isInUse = false;
     try {
         entry.surface = std::make_unique<Surface>(
-            _surroundings, entry.name, entry.maker, entry.events,
+            _surroundings, entry.name, entry.maker, entry.keyboard, entry.events,
             [this, &entry](const std::string &reason) { handleLoss(entry, reason); });
     } catch (const std::runtime_error &error) {
         entry.isInUse = dynamic_cast<const SurfaceInUse *>(&error) != nullptr;

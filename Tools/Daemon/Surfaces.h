@@ -41,9 +41,11 @@ public:
     void onRemoved(const Linux::DeviceIdentity &device) override;
     void onChanged(const Linux::DeviceIdentity &device) override;
 
-    /// A surface that the system does not tell of.
-    /// @param events  Where its accelerometer is; null: that of all surfaces.
-    void add(const SurfaceName &name, DeviceMaker maker, std::shared_ptr<Host::EventSystem> events = nullptr);
+    /// Adds a surface that the system does not report.
+    /// @param keyboard  Receives its keys. Borrowed.
+    /// @param events    Where its accelerometer is; null: that of all surfaces.
+    void add(const SurfaceName &name, DeviceMaker maker, Keyboard &keyboard,
+             std::shared_ptr<Host::EventSystem> events = nullptr);
 
     /// Has every surface listen anew as soon as nothing is touched there.
     void reschedule();
@@ -64,6 +66,7 @@ private:
         SurfaceName name;
         std::string syspath; ///< empty for those that the system does not tell of
         DeviceMaker maker;
+        Keyboard &keyboard;
         std::shared_ptr<Host::EventSystem> events;
         std::unique_ptr<Surface> surface = {}; ///< null while it does not work
         std::uint64_t openedNs = 0;

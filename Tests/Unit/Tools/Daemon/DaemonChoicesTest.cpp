@@ -61,6 +61,20 @@ TEST(DaemonChoices, SimulatedOnesAloneAskTheSystemForNothing) {
     EXPECT_THAT(deviceFilterOf(options).nodes, IsEmpty());
 }
 
+TEST(DaemonChoices, KeysArePressedForRealSurfacesAndForSimulatedOnesOnRequest) {
+    DaemonOptions options;
+    EXPECT_TRUE(pressesKeys(options));
+    options.devices = {SimulatedFinger{}};
+    EXPECT_FALSE(pressesKeys(options));
+    options.sendsSimulatedKeys = true;
+    EXPECT_TRUE(pressesKeys(options));
+    options.sendsSimulatedKeys = false;
+    options.devices.emplace_back("/dev/hidraw3");
+    EXPECT_TRUE(pressesKeys(options));
+    options.sendsKeys = false;
+    EXPECT_FALSE(pressesKeys(options));
+}
+
 TEST(DaemonChoices, AccelerometersFitByTheOption) {
     using Choice = AccelOption::Choice;
     EXPECT_TRUE(takes({.choice = Choice::Any, .name = ""}, "accel_3d"));

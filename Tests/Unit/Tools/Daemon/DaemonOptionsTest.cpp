@@ -58,6 +58,7 @@ TEST(DaemonOptions, WithoutAnyItPressesKeysForWhatIsFound) {
     EXPECT_EQ(options.accel, AccelOption{});
     EXPECT_EQ(options.keys, KeyMap());
     EXPECT_TRUE(options.sendsKeys);
+    EXPECT_FALSE(options.sendsSimulatedKeys);
     EXPECT_FALSE(options.showsEvents);
     EXPECT_FALSE(options.describe);
     EXPECT_FALSE(options.waits);
@@ -106,6 +107,13 @@ TEST(DaemonOptions, OneAccelerometerIsChosen) {
     EXPECT_EQ(optionsOf({"--accel", "accel_3d"}).accel, (AccelOption{Choice::Named, "accel_3d"}));
     EXPECT_EQ(optionsOf({"--accel", "/dev/iio:device0"}).accel,
               (AccelOption{Choice::Named, "/dev/iio:device0"}));
+}
+
+TEST(DaemonOptions, SimulatedSurfacesPressKeysOnlyOnRequest) {
+    EXPECT_FALSE(optionsOf({"--device", "sim:day"}).sendsSimulatedKeys);
+    const DaemonOptions options = optionsOf({"--device", "sim:day", "--keys"});
+    EXPECT_TRUE(options.sendsSimulatedKeys);
+    EXPECT_TRUE(options.sendsKeys);
 }
 
 TEST(DaemonOptions, KeysAreMappedOneByOne) {
@@ -160,8 +168,8 @@ TEST(DaemonOptions, HelpSaysWhatItIsAndNamesEveryOption) {
     EXPECT_THAT(help, StartsWith("Turns touches of the touch surface into media keys: "));
     EXPECT_THAT(help, HasSubstr("\nUsage: zorvatouchd [OPTIONS]\n"));
     for (const char *option :
-         {"--device", "--seed", "--duration", "--id", "--wait", "--accel", "--map", "--no-keys", "--events",
-          "--save", "--log-level", "--describe", "--plugin", "--version"})
+         {"--device", "--seed", "--duration", "--id", "--wait", "--accel", "--map", "--no-keys", "--keys",
+          "--events", "--save", "--log-level", "--describe", "--plugin", "--version"})
         EXPECT_THAT(help, HasSubstr(std::string("\n  ") + option + " ")) << option;
     for (const char *group : {"Surfaces", "Keys", "Output", "Other", "Examples", "Signals", "Exit status"})
         EXPECT_THAT(help, HasSubstr(std::string("\n") + group + ":\n")) << group;
@@ -272,6 +280,8 @@ TEST(DaemonOptions, WhatDoesNotGoTogetherIsRefused) {
     EXPECT_EQ(problemWith({"--events", "json", "--describe"}), "--describe and --events exclude each other");
     EXPECT_EQ(problemWith({"--describe", "--wait"}), "--describe and --wait exclude each other");
     EXPECT_EQ(problemWith({"--no-keys", "--describe"}), "--describe and --no-keys exclude each other");
+    EXPECT_EQ(problemWith({"--keys", "--describe"}), "--describe and --keys exclude each other");
+    EXPECT_EQ(problemWith({"--keys", "--no-keys"}), "--keys and --no-keys exclude each other");
     EXPECT_EQ(problemWith({"--describe", "--device", "sim:day", "--duration", "1"}),
               "--describe and --duration exclude each other");
 }

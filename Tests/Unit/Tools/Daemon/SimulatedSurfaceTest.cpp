@@ -70,7 +70,8 @@ protected:
     void SetUp() override {
         surfaces->add(
             {.id = "sim", .node = "sim", .name = ""},
-            [this](const std::shared_ptr<Linux::HidrawObserver> &) { return Ref<ZorvaDevice>(device); });
+            [this](const std::shared_ptr<Linux::HidrawObserver> &) { return Ref<ZorvaDevice>(device); },
+            keyboard);
         platform.waitUntilServing();
     }
 

@@ -133,9 +133,9 @@ TEST_F(SurfacesTest, NeitherDoTwoThatTheSystemDoesNotTellOf) {
         return Simulated::Device::create();
     };
     const SurfaceName name{.id = "sim:day", .node = "sim:day", .name = ""};
-    surfaces->add(name, nothing);
-    surfaces->add(name, nothing);
-    surfaces->add(name, nothing);
+    surfaces->add(name, nothing, keyboard);
+    surfaces->add(name, nothing, keyboard);
+    surfaces->add(name, nothing, keyboard);
     EXPECT_THAT(told.surfaces.lines(),
                 ElementsAre("added sim:day", "opened sim:day", "added sim:day-2", "opened sim:day-2",
                             "added sim:day-3", "opened sim:day-3"));
