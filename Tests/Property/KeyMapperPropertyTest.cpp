@@ -2,6 +2,7 @@
 #include "Tests/Support/FramesGenerators.h"
 #include "Tools/Daemon/HeldKeys.h"
 #include "Tools/Daemon/KeyMapper.h"
+#include "Tools/Daemon/KeyQuarantine.h"
 #include "Tools/Stimulus/EventNames.h"
 
 #include <gtest/gtest.h>
@@ -221,6 +222,47 @@ RC_GTEST_PROP(KeyMapperProperty, WhatTheRecognizerMakesIsNeverWasted, ()) {
         }
     }
     RC_CLASSIFY(changeCount > 0u, "with presses");
+}
+
+/// Whatever a surface does, however fast: no key stays down, and no second has more presses than the limit.
+RC_GTEST_PROP(KeyQuarantineProperty, KeysComeUpAndNoSecondHasTooManyPresses, ()) {
+    constexpr std::uint64_t kMs = 1'000'000;
+    const auto limit = *gen::inRange(1u, 6u);
+    KeyMapper mapper(*anyMap());
+    KeyQuarantine quarantine(limit);
+    std::vector<std::uint64_t> pressed;
+    std::uint64_t timeNs = 0, attempts = 0, suppressed = 0;
+    bool isActive = false;
+    KeyCode down = kNoKey;
+    const auto take = [&](const Step &step) {
+        const KeyChanges given = give(mapper, step);
+        attempts += static_cast<std::uint64_t>(
+            std::ranges::count_if(given, [](KeyChange change) { return change.isPressed; }));
+        const auto [changes, transition] = quarantine.filter(given, timeNs);
+        for (const KeyChange change : changes) {
+            RC_ASSERT(down == (change.isPressed ? kNoKey : change.code));
+            down = change.isPressed ? change.code : kNoKey;
+            if (change.isPressed)
+                pressed.push_back(timeNs);
+        }
+        RC_ASSERT(down == quarantine.keyDown());
+        if (transition != KeyQuarantine::Transition::None) {
+            RC_ASSERT(isActive == (transition == KeyQuarantine::Transition::Ends));
+            suppressed += isActive ? quarantine.suppressed() : 0;
+            isActive = !isActive;
+        }
+        RC_ASSERT(!isActive || down == kNoKey);
+    };
+    for (const Step &step : *upTo(200, anyStep())) {
+        timeNs += *gen::weightedElement<std::uint64_t>({{30, 0}, {10, 50}, {2, 400}, {1, 2000}}) * kMs;
+        take(step);
+    }
+    take({.kind = Step::kEnd, .region = 3});
+    RC_ASSERT(down == kNoKey);
+    RC_ASSERT(attempts == pressed.size() + suppressed + (isActive ? quarantine.suppressed() : 0));
+    for (std::size_t first = 0; first + limit < pressed.size(); ++first)
+        RC_ASSERT(pressed[first + limit] - pressed[first] >= KeyQuarantine::kWindowNs);
+    RC_CLASSIFY(attempts > pressed.size(), "with a quarantine");
 }
 
 RC_GTEST_PROP(KeyMapProperty, AMapsTextsMakeTheSameMap, ()) {

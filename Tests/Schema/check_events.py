@@ -12,7 +12,7 @@ import sys
 
 import jsonschema  # Debian's python3-jsonschema; without it there is nothing to test, which is a failure
 
-KINDS = {"surface", "gesture", "key", "accelerometer", "sleep", "recording", "dropped"}
+KINDS = {"surface", "gesture", "key", "quarantine", "accelerometer", "sleep", "recording", "dropped"}
 SURFACE = {"type": "surface", "state": "added", "surface": "a", "node": "/dev/hidraw0", "name": "", "timeNs": 1}
 GESTURE = {"type": "gesture", "surface": "a", "gesture": "tap", "region": None, "timeNs": 1}
 KEY = {"type": "key", "key": None, "code": 1, "state": "up", "sent": True, "surface": "a", "timeNs": 1}
@@ -35,6 +35,8 @@ BROKEN = {
     "a key that is none": KEY | {"key": "none", "code": 0},
     "a code that the kernel does not have": KEY | {"code": 768},
     "a key in between": KEY | {"state": "repeat"},
+    "a quarantine without a press": {"type": "quarantine", "state": "ends", "surface": "a", "suppressed": 0,
+                                     "timeNs": 1},
     "no lost line": {"type": "dropped", "lines": 0},
 }
 

@@ -55,6 +55,8 @@ Daemon::Daemon(const DaemonOptions &options, DaemonSurroundings surroundings)
                  .keyQueue = _keyQueue,
                  .keyboard = _keyboard,
                  .keyMap = options.keys,
+                 .keyLimit = {.pressesPerSecond = options.keyLimit,
+                              .ticks = Util::TickConverter(_surroundings.clock)},
                  .listener = *_listener,
                  .loop = _loop,
                  .log = DaemonLog(*_logs, "Surfaces")},

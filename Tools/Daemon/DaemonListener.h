@@ -5,6 +5,7 @@
 #include "Tools/Daemon/KeyMap.h"
 
 #include <cstddef>
+#include <cstdint>
 #include <string>
 #include <string_view>
 
@@ -35,6 +36,11 @@ public:
     /// @param isSent  Whether there is a keyboard; else it would have.
     virtual void onKey(const SurfaceName & /*surface*/, const HostEvent * /*cause*/, KeyChange /*change*/,
                        bool /*isSent*/) noexcept {}
+    /// The surface's presses exceed the rate limit and do not reach the keyboard, or do so again. On the key
+    /// thread.
+    /// @param suppressed  Presses that did not reach it so far.
+    virtual void onQuarantine(const SurfaceName & /*surface*/, bool /*begins*/,
+                              std::uint64_t /*suppressed*/) noexcept {}
     virtual void onAccelerometer(const std::string & /*name*/, bool /*isUsed*/) noexcept {}
     virtual void onSleep(bool /*begins*/) noexcept {}
     virtual void onRecording(const SurfaceName & /*surface*/, const std::string & /*file*/,

@@ -203,8 +203,16 @@ private:
                    "GESTURE       tap, hold\n"
                    "REGION        play-pause, volume-down, volume-up\n"
                    "KEY           the kernel's name of it, as KEY_NEXTSONG; or none");
+        declareKeyLimit(kGroup);
         addFlag(kGroup, "--no-keys", _noKeys, "Show the keys instead of pressing them");
         addFlag(kGroup, "--keys", _keys, "Press the keys of simulated surfaces, too (default: show them)");
+    }
+
+    void declareKeyLimit(const char *group) {
+        addOption(group, "--key-limit", _keyLimit, "N",
+                  "Suspend the keys of a surface that makes more presses\n"
+                  "per second than this (default: " +
+                      std::to_string(KeyQuarantine::kDefaultLimit) + "; 0: no limit)");
     }
 
     void declareOutput() {
@@ -237,6 +245,7 @@ private:
         if (_accel)
             options.accel = parseAccel(*_accel);
         readMaps(options);
+        readKeys(options);
         readOutput(options);
         options.plugIn = _plugIn;
         requireDescriptionAlone();
@@ -301,15 +310,30 @@ private:
             }
     }
 
+    void readKeys(DaemonOptions &options) const {
+        if (_keys && _noKeys)
+            throw CliError("--keys and --no-keys exclude each other");
+        options.sendsKeys = !_noKeys;
+        options.sendsSimulatedKeys = _keys;
+        if (_keyLimit)
+            options.keyLimit = readKeyLimit(*_keyLimit);
+    }
+
+    [[nodiscard]] static unsigned readKeyLimit(const std::string &text) {
+        unsigned limit = 0;
+        const char *const end = text.data() + text.size();
+        const auto [stop, error] = std::from_chars(text.data(), end, limit);
+        if (error != std::errc() || stop != end || limit > KeyQuarantine::kHighestLimit)
+            throw CliError("--key-limit: '" + text + "': must be an integer from 0 to " +
+                           std::to_string(KeyQuarantine::kHighestLimit));
+        return limit;
+    }
+
     void readOutput(DaemonOptions &options) const {
         if (_events && *_events != "json")
             refuse("--events", *_events, "no format; there is json");
         options.showsEvents = _events.has_value();
-        if (_keys && _noKeys)
-            throw CliError("--keys and --no-keys exclude each other");
-        options.sendsKeys = !_noKeys;
         options.waits = _wait;
-        options.sendsSimulatedKeys = _keys;
         options.describe = _describe;
         if (_save)
             requireFileName("--save", *_save);
@@ -338,7 +362,7 @@ private:
     CLI::App _app;
     // As typed.
     std::vector<std::string> _devices, _ids, _maps;
-    std::optional<std::string> _seed, _duration, _accel, _events, _save, _logLevel, _plugIn;
+    std::optional<std::string> _seed, _duration, _accel, _events, _save, _logLevel, _plugIn, _keyLimit;
     bool _keys = false, _noKeys = false, _describe = false, _wait = false;
 };
 

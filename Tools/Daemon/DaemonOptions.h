@@ -4,6 +4,7 @@
 #include "Shared/Ports/Log.h"
 #include "Tools/Cli/Options.h"
 #include "Tools/Daemon/KeyMap.h"
+#include "Tools/Daemon/KeyQuarantine.h"
 #include "Tools/Hosting/FingerSource.h"
 
 #include <optional>
@@ -36,11 +37,12 @@ struct DaemonOptions {
     std::vector<Linux::HidId> ids{{0x1234, 0xABCD}}; ///< which makes it looks for
     AccelOption accel;
     KeyMap keys;
-    bool sendsKeys = true;           ///< of real surfaces; shows them if false
-    bool sendsSimulatedKeys = false; ///< the same for simulated surfaces; needs `sendsKeys`
-    bool showsEvents = false;        ///< as lines of JSON
-    bool waits = false;              ///< for surfaces that another program uses, rather than ending
-    bool describe = false;           ///< says what is there, and that is all
+    bool sendsKeys = true;                            ///< of real surfaces; shows them if false
+    bool sendsSimulatedKeys = false;                  ///< the same for simulated surfaces; needs `sendsKeys`
+    unsigned keyLimit = KeyQuarantine::kDefaultLimit; ///< presses per second and surface; 0: no limit
+    bool showsEvents = false;                         ///< as lines of JSON
+    bool waits = false;    ///< for surfaces that another program uses, rather than ending
+    bool describe = false; ///< says what is there, and that is all
     std::optional<std::string> saveFile;
     Ports::LogLevel logLevel = Ports::LogLevel::Default;
     std::optional<std::string> plugIn; ///< nothing: the one beside the program

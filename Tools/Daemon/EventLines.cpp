@@ -85,6 +85,14 @@ void appendLine(std::string &text, const KeyNews &news) {
         .endAt(news.timeNs);
 }
 
+void appendLine(std::string &text, const QuarantineNews &news) {
+    Line(text, "quarantine")
+        .add("state", std::string_view(news.begins ? "begins" : "ends"))
+        .add("surface", news.surface)
+        .add("suppressed", news.suppressed)
+        .endAt(news.timeNs);
+}
+
 void appendLine(std::string &text, const AccelerometerNews &news) {
     Line(text, "accelerometer")
         .add("state", std::string_view(news.isUsed ? "used" : "gone"))

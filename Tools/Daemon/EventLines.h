@@ -42,6 +42,13 @@ struct KeyNews {
     std::uint64_t timeNs = 0;
 };
 
+struct QuarantineNews {
+    bool begins = true; ///< or it ends
+    std::string_view surface;
+    std::uint64_t suppressed = 0; ///< presses so far
+    std::uint64_t timeNs = 0;
+};
+
 struct AccelerometerNews {
     bool isUsed = true; ///< or it is gone
     std::string_view name;
@@ -70,6 +77,7 @@ struct DroppedNews {
 void appendLine(std::string &text, const SurfaceNews &news);
 void appendLine(std::string &text, const GestureNews &news);
 void appendLine(std::string &text, const KeyNews &news);
+void appendLine(std::string &text, const QuarantineNews &news);
 void appendLine(std::string &text, const AccelerometerNews &news);
 void appendLine(std::string &text, const SleepNews &news);
 void appendLine(std::string &text, const RecordingNews &news);

@@ -27,6 +27,11 @@ void ListenerGroup::onKey(const SurfaceName &surface, const HostEvent *cause, Ke
         member->onKey(surface, cause, change, isSent);
 }
 
+void ListenerGroup::onQuarantine(const SurfaceName &surface, bool begins, std::uint64_t suppressed) noexcept {
+    for (const auto &member : _members)
+        member->onQuarantine(surface, begins, suppressed);
+}
+
 void ListenerGroup::onAccelerometer(const std::string &name, bool isUsed) noexcept {
     for (const auto &member : _members)
         member->onAccelerometer(name, isUsed);
@@ -63,6 +68,17 @@ void LogListener::onSurface(const SurfaceName &surface, SurfaceState state,
         _log.notice({surface.node, ": removed (", surface.id, ")"});
         break;
     }
+}
+
+void LogListener::onQuarantine(const SurfaceName &surface, bool begins, std::uint64_t suppressed) noexcept {
+    if (begins)
+        _log.error(
+            {surface.node,
+             ": more key presses per second than --key-limit allows; its keys are not pressed until it has "
+             "been quiet for 2 s"});
+    else
+        _log.notice({surface.node, ": its keys are pressed again; ", std::to_string(suppressed),
+                     " presses were suppressed"});
 }
 
 void LogListener::onSleep(bool begins) noexcept {
@@ -106,6 +122,10 @@ void JsonListener::onEvent(const SurfaceName &surface, const HostEvent &event) n
 void JsonListener::onKey(const SurfaceName &surface, const HostEvent * /*cause*/, KeyChange change,
                          bool isSent) noexcept {
     put(KeyNews{.change = change, .isSent = isSent, .surface = surface.id, .timeNs = nowNs()});
+}
+
+void JsonListener::onQuarantine(const SurfaceName &surface, bool begins, std::uint64_t suppressed) noexcept {
+    put(QuarantineNews{.begins = begins, .surface = surface.id, .suppressed = suppressed, .timeNs = nowNs()});
 }
 
 void JsonListener::onAccelerometer(const std::string &name, bool isUsed) noexcept {

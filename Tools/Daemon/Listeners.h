@@ -23,6 +23,7 @@ public:
     void onEvent(const SurfaceName &surface, const HostEvent &event) noexcept override;
     void onKey(const SurfaceName &surface, const HostEvent *cause, KeyChange change,
                bool isSent) noexcept override;
+    void onQuarantine(const SurfaceName &surface, bool begins, std::uint64_t suppressed) noexcept override;
     void onAccelerometer(const std::string &name, bool isUsed) noexcept override;
     void onSleep(bool begins) noexcept override;
     void onRecording(const SurfaceName &surface, const std::string &file,
@@ -39,6 +40,7 @@ public:
     explicit LogListener(DaemonLog log) : _log(std::move(log)) {}
 
     void onSurface(const SurfaceName &surface, SurfaceState state, std::string_view reason) noexcept override;
+    void onQuarantine(const SurfaceName &surface, bool begins, std::uint64_t suppressed) noexcept override;
     void onSleep(bool begins) noexcept override;
     void onRecording(const SurfaceName &surface, const std::string &file,
                      std::size_t reports) noexcept override;
@@ -57,6 +59,7 @@ public:
     void onEvent(const SurfaceName &surface, const HostEvent &event) noexcept override;
     void onKey(const SurfaceName &surface, const HostEvent *cause, KeyChange change,
                bool isSent) noexcept override;
+    void onQuarantine(const SurfaceName &surface, bool begins, std::uint64_t suppressed) noexcept override;
     void onAccelerometer(const std::string &name, bool isUsed) noexcept override;
     void onSleep(bool begins) noexcept override;
     void onRecording(const SurfaceName &surface, const std::string &file,

@@ -50,8 +50,9 @@ void Surface::stop() {
 }
 
 void Surface::schedule() {
-    _keys = std::make_shared<SurfaceKeys>(_name, _surroundings.keyMap, _keyboard, _surroundings.listener,
-                                          [observer = _observer] { observer->tellHeld(); });
+    _keys = std::make_shared<SurfaceKeys>(
+        _name, _surroundings.keyMap, _keyboard, _surroundings.listener,
+        [observer = _observer] { observer->tellHeld(); }, _surroundings.keyLimit);
     _observer->begin(_keys);
     _service->setEventCallback(SurfaceKeys::receive, _keys.get());
     try {

@@ -27,6 +27,7 @@ struct SurfaceSurroundings {
     Host::SerialQueue &keyQueue;
     Keyboard &keyboard; ///< of surfaces that the system reports
     KeyMap keyMap;
+    KeyLimit keyLimit = {};
     DaemonListener &listener;
     Linux::MainLoop &loop;
     DaemonLog log;

@@ -8,9 +8,9 @@
 namespace ZorvaTouch::Tools {
 
 SurfaceKeys::SurfaceKeys(SurfaceName surface, const KeyMap &map, Keyboard &keyboard, DaemonListener &listener,
-                         std::function<void()> onHeld)
-    : _surface(std::move(surface)), _mapper(map), _keyboard(keyboard), _listener(listener),
-      _onHeld(std::move(onHeld)) {}
+                         std::function<void()> onHeld, KeyLimit limit)
+    : _surface(std::move(surface)), _mapper(map), _quarantine(limit.pressesPerSecond), _ticks(limit.ticks),
+      _keyboard(keyboard), _listener(listener), _onHeld(std::move(onHeld)) {}
 
 void SurfaceKeys::receive(void *target, void * /*refcon*/, void * /*sender*/, const ZorvaEvent *event,
                           std::uint32_t /*options*/) noexcept {
@@ -25,14 +25,28 @@ void SurfaceKeys::receive(void *target, void * /*refcon*/, void * /*sender*/, co
 
 void SurfaceKeys::handle(const HostEvent &event) noexcept {
     _listener.onEvent(_surface, event);
-    apply(&event, _mapper.handle(event));
+    const auto [changes, transition] =
+        _quarantine.filter(_mapper.handle(event), _ticks.nanosecondsFromMachTime(event.timestamp()));
+    if (transition == KeyQuarantine::Transition::Ends)
+        tellQuarantine(false);
+    apply(&event, changes);
+    if (transition == KeyQuarantine::Transition::Begins)
+        tellQuarantine(true);
 }
 
-void SurfaceKeys::end(SurfaceEnd end) noexcept { apply(nullptr, _mapper.handle(end)); }
+void SurfaceKeys::end(SurfaceEnd end) noexcept {
+    apply(nullptr, _quarantine.filter(_mapper.handle(end), 0).changes);
+    if (_mapper.state() == KeyMapper::State::Over && _quarantine.end())
+        tellQuarantine(false);
+}
+
+void SurfaceKeys::tellQuarantine(bool begins) noexcept {
+    _listener.onQuarantine(_surface, begins, _quarantine.suppressed());
+}
 
 void SurfaceKeys::apply(const HostEvent *cause, const KeyChanges &changes) noexcept {
     _keyboard.apply(_surface, cause, changes);
-    const bool wasHeld = std::exchange(_isHeld, _mapper.keyDown() != kNoKey);
+    const bool wasHeld = std::exchange(_isHeld, _quarantine.keyDown() != kNoKey);
     if (_onHeld && _isHeld && !wasHeld)
         _onHeld();
     _isIdle = _mapper.state() == KeyMapper::State::Idle || _mapper.state() == KeyMapper::State::Over;

@@ -116,6 +116,15 @@ TEST(DaemonOptions, SimulatedSurfacesPressKeysOnlyOnRequest) {
     EXPECT_TRUE(options.sendsKeys);
 }
 
+TEST(DaemonOptions, TheKeyLimitIsACountOrOff) {
+    EXPECT_EQ(optionsOf({}).keyLimit, 20u);
+    EXPECT_EQ(optionsOf({"--key-limit", "7"}).keyLimit, 7u);
+    EXPECT_EQ(optionsOf({"--key-limit", "0"}).keyLimit, 0u);
+    for (const char *limit : {"", "-1", "1001", "2.5", "x"})
+        EXPECT_EQ(problemWith({"--key-limit", limit}),
+                  "--key-limit: '" + std::string(limit) + "': must be an integer from 0 to 1000");
+}
+
 TEST(DaemonOptions, KeysAreMappedOneByOne) {
     KeyMap map;
     map.assign("tap:volume-up=KEY_NEXTSONG");
@@ -169,7 +178,7 @@ TEST(DaemonOptions, HelpSaysWhatItIsAndNamesEveryOption) {
     EXPECT_THAT(help, HasSubstr("\nUsage: zorvatouchd [OPTIONS]\n"));
     for (const char *option :
          {"--device", "--seed", "--duration", "--id", "--wait", "--accel", "--map", "--no-keys", "--keys",
-          "--events", "--save", "--log-level", "--describe", "--plugin", "--version"})
+          "--key-limit", "--events", "--save", "--log-level", "--describe", "--plugin", "--version"})
         EXPECT_THAT(help, HasSubstr(std::string("\n  ") + option + " ")) << option;
     for (const char *group : {"Surfaces", "Keys", "Output", "Other", "Examples", "Signals", "Exit status"})
         EXPECT_THAT(help, HasSubstr(std::string("\n") + group + ":\n")) << group;

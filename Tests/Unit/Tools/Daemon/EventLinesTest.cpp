@@ -129,6 +129,8 @@ std::string oneOfEach() {
     appendLine(text, KeyNews{{kKeyVolumeUp, true}, true, kSurface, 8000});
     appendLine(text, KeyNews{{kKeyVolumeUp, false}, true, kSurface, 9000});
     appendLine(text, KeyNews{{30, false}, false, kSurface, 10000});
+    appendLine(text, QuarantineNews{true, kSurface, 1, 10100});
+    appendLine(text, QuarantineNews{false, kSurface, 2100, 10200});
     appendLine(text, AccelerometerNews{true, "accel_3d", 11000});
     appendLine(text, AccelerometerNews{false, "accel_3d", 12000});
     appendLine(text, SleepNews{true, 13000});

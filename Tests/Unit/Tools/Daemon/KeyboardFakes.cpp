@@ -168,6 +168,11 @@ void ListenerJournal::onKey(const SurfaceName &surface, const HostEvent *cause, 
              (cause ? " by " + gestureText(*cause) : ""));
 }
 
+void ListenerJournal::onQuarantine(const SurfaceName &surface, bool begins,
+                                   std::uint64_t suppressed) noexcept {
+    others.add("quarantine of " + surface.id + (begins ? " begins " : " ends ") + std::to_string(suppressed));
+}
+
 void ListenerJournal::onAccelerometer(const std::string &name, bool isUsed) noexcept {
     others.add("accelerometer " + name + (isUsed ? " used" : " gone"));
 }

@@ -85,6 +85,7 @@ public:
     void onEvent(const SurfaceName &surface, const HostEvent &event) noexcept override;
     void onKey(const SurfaceName &surface, const HostEvent *cause, KeyChange change,
                bool isSent) noexcept override;
+    void onQuarantine(const SurfaceName &surface, bool begins, std::uint64_t suppressed) noexcept override;
     void onAccelerometer(const std::string &name, bool isUsed) noexcept override;
     void onSleep(bool begins) noexcept override;
     void onRecording(const SurfaceName &surface, const std::string &file,

@@ -51,6 +51,7 @@ TEST_F(ListenersTest, ProgramsHearOfEverythingAsLinesOfJson) {
     json.onSurface(surface, SurfaceState::Failed, "open: Permission denied");
     json.onEvent(surface, *gestureEvent(Gesture::HoldStart, kPixelRegionVolumeUp, 24));
     json.onKey(surface, nullptr, {kKeyVolumeUp, true}, false);
+    json.onQuarantine(surface, true, 1);
     json.onAccelerometer("accel_3d", true);
     json.onSleep(true);
     json.onRecording(surface, "/tmp/a.json", 7);
@@ -66,6 +67,8 @@ TEST_F(ListenersTest, ProgramsHearOfEverythingAsLinesOfJson) {
         "\n"
         R"({"type":"key","key":"KEY_VOLUMEUP","code":115,"state":"down","sent":false,"surface":"SN1",)"
         R"("timeNs":41666})"
+        "\n"
+        R"({"type":"quarantine","state":"begins","surface":"SN1","suppressed":1,"timeNs":41666})"
         "\n"
         R"({"type":"accelerometer","state":"used","name":"accel_3d","timeNs":41666})"
         "\n"
@@ -131,6 +134,17 @@ TEST_F(ListenersTest, TheLogHearsOfWhatComesAndGoesAndFails) {
                             "Surfaces: /dev/hidraw1: recording saved to /tmp/a.json, 7 reports"));
 }
 
+TEST_F(ListenersTest, TheLogHasTheBeginningAndTheEndOfAQuarantine) {
+    LogListener log(DaemonLog(logs, "Surfaces"));
+    log.onQuarantine(surface, true, 1);
+    log.onQuarantine(surface, false, 2100);
+    EXPECT_THAT(
+        logs.lines().lines(),
+        ElementsAre("Surfaces error: /dev/hidraw1: more key presses per second than --key-limit allows; "
+                    "its keys are not pressed until it has been quiet for 2 s",
+                    "Surfaces: /dev/hidraw1: its keys are pressed again; 2100 presses were suppressed"));
+}
+
 TEST_F(ListenersTest, TheLogHearsOfNoGestureAndNoKey) {
     LogListener log(DaemonLog(logs, "Surfaces"));
     log.onEvent(surface, *gestureEvent(Gesture::Tap, kPixelRegionPlayPause));
@@ -150,6 +164,7 @@ TEST_F(ListenersTest, AGroupTellsEach) {
     group.onSurface(surface, SurfaceState::Failed, "x");
     group.onEvent(surface, *tap);
     group.onKey(surface, tap.get(), {kKeyPlayPause, true}, true);
+    group.onQuarantine(surface, true, 1);
     group.onAccelerometer("a", true);
     group.onSleep(false);
     group.onRecording(surface, "f", 1);
@@ -157,7 +172,8 @@ TEST_F(ListenersTest, AGroupTellsEach) {
         EXPECT_THAT(each->surfaces.lines(), ElementsAre("failed SN1: x"));
         EXPECT_THAT(each->events.lines(), ElementsAre("SN1 tap play/pause"));
         EXPECT_THAT(each->keys.lines(), ElementsAre("SN1 +164 by tap"));
-        EXPECT_THAT(each->others.lines(), ElementsAre("accelerometer a used", "awake", "recording SN1 f 1"));
+        EXPECT_THAT(each->others.lines(), ElementsAre("quarantine of SN1 begins 1", "accelerometer a used",
+                                                      "awake", "recording SN1 f 1"));
     }
 }
 

@@ -14,6 +14,7 @@ namespace {
 
 using testing::ElementsAre;
 using testing::IsEmpty;
+using testing::SizeIs;
 using Tests::gestureEvent;
 
 class SurfaceKeysTest : public testing::Test {
@@ -90,6 +91,46 @@ TEST_F(SurfaceKeysTest, AfterSleepTheNextTouchCounts) {
     receive(Gesture::MayBegin);
     receive(Gesture::Tap);
     EXPECT_THAT(told.keys.lines(), ElementsAre("SN1 +115 by tap", "SN1 -115 by tap"));
+}
+
+TEST_F(SurfaceKeysTest, TooManyPressesPerSecondStopKeysButNotEvents) {
+    SurfaceKeys limited({.id = "SN2", .node = "", .name = ""}, KeyMap(), keyboard, told, {},
+                        {.pressesPerSecond = 2, .ticks = Util::TickConverter({1000, 1})}); // ticks of 1 us
+    const auto tapAt = [&](std::uint64_t us) {
+        for (const Gesture gesture : {Gesture::MayBegin, Gesture::Tap}) {
+            const auto object = makeEvent(gestureEvent(gesture, kPixelRegionVolumeUp, us));
+            SurfaceKeys::receive(&limited, nullptr, nullptr, object.get(), 0);
+        }
+    };
+    for (std::uint64_t tap = 0; tap < 100; ++tap)
+        tapAt(tap * 1000);
+    EXPECT_THAT(told.events.lines(), SizeIs(200));
+    EXPECT_THAT(told.keys.take(), SizeIs(4));
+    EXPECT_THAT(told.others.take(), ElementsAre("quarantine of SN2 begins 1"));
+    tapAt(2'099'000); // 2 s after the last one
+    EXPECT_THAT(told.others.take(), ElementsAre("quarantine of SN2 ends 98"));
+    EXPECT_THAT(told.keys.take(), ElementsAre("SN2 +115 by tap", "SN2 -115 by tap"));
+    for (int tap = 0; tap < 2; ++tap)
+        tapAt(2'100'000);
+    limited.end(SurfaceEnd::Suspended);
+    EXPECT_THAT(told.others.take(), ElementsAre("quarantine of SN2 begins 1"));
+    limited.end(SurfaceEnd::DeviceGone);
+    limited.end(SurfaceEnd::Stopped);
+    EXPECT_THAT(told.others.take(), ElementsAre("quarantine of SN2 ends 1"));
+}
+
+TEST_F(SurfaceKeysTest, APressThatIsSuppressedDoesNotReleaseTheKeyOfAnotherSurface) {
+    SurfaceKeys limited({.id = "SN2", .node = "", .name = ""}, KeyMap(), keyboard, told, {},
+                        {.pressesPerSecond = 1});
+    receive(Gesture::MayBegin);
+    receive(Gesture::HoldStart);
+    for (const Gesture gesture : {Gesture::MayBegin, Gesture::Tap, Gesture::MayBegin, Gesture::Tap}) {
+        const auto object = makeEvent(gestureEvent(gesture, kPixelRegionVolumeUp));
+        SurfaceKeys::receive(&limited, nullptr, nullptr, object.get(), 0);
+    }
+    EXPECT_THAT(keys.down(), ElementsAre(kKeyVolumeUp));
+    surface.end(SurfaceEnd::Stopped);
+    limited.end(SurfaceEnd::Stopped);
 }
 
 TEST_F(SurfaceKeysTest, AnEventThatIsNoneChangesNothing) {

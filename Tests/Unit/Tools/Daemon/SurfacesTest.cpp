@@ -522,7 +522,7 @@ TEST_F(SurfacesTest, OneWithAnAccelerometerOfItsOwnGetsNoSamplesOfOthers) {
         surfaces->add(
             {.id = "sim", .node = "sim", .name = ""},
             [device = devices.back()](const std::shared_ptr<Linux::HidrawObserver> &) { return device; },
-            systems.back());
+            keyboard, systems.back());
         platform.waitUntilServing();
     }
     for (int i = 0; i < 3; ++i) {
