@@ -16,8 +16,8 @@ std::string nodeAdvice(int errorNumber) {
         return "; another program reads it: stop that one, or choose another accelerometer";
     case EACCES:
     case EPERM:
-        return "; let a group of this user's read it, by a udev rule: "
-               "SUBSYSTEM==\"iio\", GROUP=\"input\", MODE=\"0660\"";
+        return "; give the group of the daemon's user access by a udev rule: "
+               "SUBSYSTEM==\"iio\", GROUP=\"zorvatouch\", MODE=\"0660\"";
     default:
         return {};
     }
@@ -30,7 +30,8 @@ std::string attributeAdvice(int errorNumber) {
         return "; another program uses it: stop that one, or choose another accelerometer";
     case EACCES:
     case EPERM:
-        return "; sensors are set up by root, unless a udev rule hands their attributes to others";
+        return "; give the group of the daemon's user write access by a udev rule: SUBSYSTEM==\"iio\", "
+               "RUN+=\"/bin/sh -c 'chgrp -R zorvatouch /sys%p && chmod -R g=u /sys%p'\"";
     default:
         return {};
     }

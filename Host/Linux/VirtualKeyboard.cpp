@@ -20,8 +20,9 @@ const char *adviceFor(int errorNumber) noexcept {
         return "load the kernel's module for it: modprobe uinput";
     case EACCES:
     case EPERM:
-        return "let a group of this user's write to it, by a udev rule: "
-               "KERNEL==\"uinput\", GROUP=\"input\", MODE=\"0660\"";
+        // Its own group: each member can type into every program.
+        return "give the group of the daemon's user write access by a udev rule: "
+               "KERNEL==\"uinput\", GROUP=\"zorvatouch\", MODE=\"0660\"";
     default:
         return "it is not the kernel's uinput, or that refuses keyboards";
     }

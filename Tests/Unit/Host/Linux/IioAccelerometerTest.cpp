@@ -187,10 +187,11 @@ INSTANTIATE_TEST_SUITE_P(
     testing::Values(std::pair(EBUSY, "Device or resource busy; another program reads it: stop that one, or "
                                      "choose another accelerometer"),
                     std::pair(EACCES,
-                              "Permission denied; let a group of this user's read it, by a udev rule: "
-                              "SUBSYSTEM==\"iio\", GROUP=\"input\", MODE=\"0660\""),
-                    std::pair(EPERM, "Operation not permitted; let a group of this user's read it, by a udev "
-                                     "rule: SUBSYSTEM==\"iio\", GROUP=\"input\", MODE=\"0660\""),
+                              "Permission denied; give the group of the daemon's user access by a udev rule: "
+                              "SUBSYSTEM==\"iio\", GROUP=\"zorvatouch\", MODE=\"0660\""),
+                    std::pair(EPERM,
+                              "Operation not permitted; give the group of the daemon's user access by a "
+                              "udev rule: SUBSYSTEM==\"iio\", GROUP=\"zorvatouch\", MODE=\"0660\""),
                     std::pair(ENOENT, "No such file or directory"), std::pair(ENODEV, "No such device"),
                     std::pair(ENOMEM, "Cannot allocate memory")));
 

@@ -117,9 +117,9 @@ TEST(KeyboardFailures, SayWhatToDoWithoutTheModule) {
 
 TEST(KeyboardFailures, SayWhatToDoWithoutPermission) {
     EXPECT_STREQ(KeyboardFailure({"open", EACCES}, "/dev/uinput").what(),
-                 "open /dev/uinput: Permission denied; let a group of this "
-                 "user's write to it, by a udev rule: "
-                 "KERNEL==\"uinput\", GROUP=\"input\", MODE=\"0660\"");
+                 "open /dev/uinput: Permission denied; give the group of "
+                 "the daemon's user write access by a udev rule: "
+                 "KERNEL==\"uinput\", GROUP=\"zorvatouch\", MODE=\"0660\"");
 }
 
 TEST(KeyboardFailures, SayThatItIsNoUinput) {
