@@ -58,7 +58,7 @@ struct HidrawCounters {
 /// Threads:  as the boundary says. A feature report, on whichever thread, keeps the node open until the
 /// device
 ///           has answered, also when the device is closed meanwhile; nobody waits for it.
-/// Realtime: delivering a report takes two short locks and no memory.
+/// Realtime: delivering a report takes three short locks and allocates no memory.
 class HidrawDevice final : public BoundaryObject<HidrawDevice, ZorvaDevice> {
 public:
     /// Reads that fail one after another until the device counts as gone.

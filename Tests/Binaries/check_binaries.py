@@ -1,9 +1,10 @@
 """Checks the programs and libraries of a build tree, and of an installation made from it.
 
-Usage: check_binaries.py BUILD_DIR [--hardened]
+Usage: check_binaries.py BUILD_DIR DOCUMENT [--hardened]
 
-No library path has an empty or relative entry: the loader would take libraries from the current directory. With
---hardened, each file has what Docs/Architecture.md promises for optimized builds.
+No library path has an empty or relative entry: the loader would take libraries from the current directory. The
+installed files are those that the document lists. With --hardened, each binary has what Docs/Architecture.md promises
+for optimized builds.
 """
 
 import pathlib
@@ -53,6 +54,17 @@ def calls_fortified_functions(file):
     return re.search(r"__\w+_chk\b", readelf("--dyn-syms", file)) is not None
 
 
+def list_faults(document, prefix):
+    """Differences between the document's list, a block of paths with what they are for, and what is installed."""
+    text = document.read_text(encoding="utf-8")
+    listed = re.findall(r"^((?:bin|include|lib)/\S+)  ", text, re.MULTILINE)
+    installed = [str(file.relative_to(prefix)) for file in prefix.rglob("*") if not file.is_dir()]
+    yield from (f"{document}: {name} is not installed" for name in listed if not (prefix / name).exists())
+    for name in installed:
+        if not any(name == place or name.startswith((place if place.endswith("/") else place + ".")) for place in listed):
+            yield f"{document}: {name} is installed and not listed"
+
+
 def self_test():
     """The checks find what they are for."""
     line = " 0x000000000000001d (RUNPATH)            Library runpath: [%s]\n"
@@ -63,11 +75,12 @@ def self_test():
 
 def main():
     self_test()
-    build = pathlib.Path(sys.argv[1])
+    build, document = map(pathlib.Path, sys.argv[1:3])
     faults = []
     with tempfile.TemporaryDirectory() as prefix:
         subprocess.run(["cmake", "--install", build, "--prefix", prefix], check=True, capture_output=True)
         built, installed = binaries(build), binaries(pathlib.Path(prefix))
+        faults += list_faults(document, pathlib.Path(prefix))
         names = {file.name.split(".so.")[0] + (".so" if ".so." in file.name else "") for file in installed}
         if names != PRODUCT:
             faults.append(f"installed: {sorted(names)}, expected {sorted(PRODUCT)}")

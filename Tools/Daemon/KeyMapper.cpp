@@ -51,8 +51,8 @@ struct KeyMapper::Table {
     static constexpr Decision kHolds{State::Holding, Action::Hold};
     static constexpr Decision kIsOver{State::Over, Action::LetGo};
 
-    // What follows may-begin in an order that no touch has is taken for the touch's end: rather a gesture too
-    // few than a key that nobody lets go.
+    // What follows may-begin in an order that no touch has counts as the touch's end: when in doubt, lose a
+    // gesture rather than leave a key stuck.
     static constexpr std::array<Row, kInputCount> kRows{{
         // Idle, Touching, Holding, Over
         {kTouchBegins, kTouchBegins, kTouchBegins, kIsOver},                                    // may-begin
