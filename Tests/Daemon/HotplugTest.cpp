@@ -1,3 +1,4 @@
+#include "Host/Runtime/Signals.h"
 #include "Tests/Daemon/DaemonFixture.h"
 #include "Tests/Unit/Tools/Daemon/SurfacesFixture.h"
 
@@ -98,8 +99,13 @@ protected:
         return line.substr(begin, line.find('"', begin) - begin);
     }
 
-    const std::unique_ptr<UMockdevTestbed, void (*)(void *)> testbed{::umockdev_testbed_new(),
-                                                                     ::g_object_unref};
+    /// It starts threads, which must not take the daemon's signals.
+    [[nodiscard]] static UMockdevTestbed *newTestbed() {
+        Host::blockForGood(Daemon::kSignals);
+        return ::umockdev_testbed_new();
+    }
+
+    const std::unique_ptr<UMockdevTestbed, void (*)(void *)> testbed{newTestbed(), ::g_object_unref};
 };
 
 TEST_F(DaemonHotplug, UsesWhatIsThereWhenItStarts) {

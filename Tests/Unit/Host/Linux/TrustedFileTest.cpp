@@ -61,8 +61,8 @@ TEST_F(TrustedFile, IsWritableByItsOwnerAlone) {
 }
 
 TEST_F(TrustedFile, BelongsToATrustedUser) {
-    EXPECT_EQ(problemWith(file, ::geteuid() + 1), "the plug-in is not loaded by root: " + folder +
-                                                      " belongs to user " + std::to_string(::geteuid()) +
+    EXPECT_EQ(problemWith(file, ::geteuid() + 1), "cannot load as root: " + folder + " belongs to user " +
+                                                      std::to_string(::geteuid()) +
                                                       "; it must be writable by root alone");
 }
 
