@@ -1,52 +1,24 @@
 #include "Host/Runtime/Files.h"
 
+#include "Host/Runtime/Descriptor.h"
+#include "Host/Runtime/TemporaryFile.h"
+
 #include <fcntl.h>
+#include <linux/capability.h>
 #include <sys/stat.h>
+#include <sys/syscall.h>
 #include <unistd.h>
 
 #include <algorithm>
+#include <array>
 #include <cerrno>
 #include <csignal>
 #include <cstdlib>
 #include <memory>
 #include <optional>
-#include <utility>
 
 namespace ZorvaTouch::Host {
 namespace {
-
-/// Owns a file descriptor.
-class Descriptor {
-public:
-    explicit Descriptor(int number) noexcept : _number(number) {}
-    Descriptor(Descriptor &&other) noexcept : _number(std::exchange(other._number, -1)) {}
-    Descriptor(const Descriptor &) = delete;
-    Descriptor &operator=(const Descriptor &) = delete;
-    Descriptor &operator=(Descriptor &&) = delete;
-    ~Descriptor() {
-        if (_number >= 0)
-            ::close(_number);
-    }
-
-    [[nodiscard]] int number() const noexcept { return _number; }
-
-    /// Some file systems report a failed write only here.
-    void close() {
-        if (::close(std::exchange(_number, -1)) != 0 && errno != EINTR)
-            throw FileFailure("close", errno);
-    }
-
-private:
-    int _number;
-};
-
-/// Calls a system function again while signals interrupt it.
-template <typename Call> auto uninterrupted(const Call &call) {
-    auto result = call();
-    while (result < 0 && errno == EINTR)
-        result = call();
-    return result;
-}
 
 constexpr mode_t kForEverybody = 0666; ///< as far as the user lets new files be
 constexpr mode_t kForTheOwner = 0600;
@@ -80,89 +52,42 @@ std::size_t readSome(int descriptor, char *to, std::size_t size) {
     return static_cast<std::size_t>(count);
 }
 
-void writeAll(int descriptor, std::string_view text) {
-    while (!text.empty()) {
-        const auto count = uninterrupted([&] { return ::write(descriptor, text.data(), text.size()); });
-        if (count < 0)
-            throw FileFailure("write", errno);
-        text.remove_prefix(static_cast<std::size_t>(count));
-    }
-}
-
 /// The file that a link points at, so that renaming replaces that one; `path` itself if it does not exist.
 std::string resolveLinks(const std::string &path) {
     const std::unique_ptr<char, decltype(&std::free)> resolved(::realpath(path.c_str(), nullptr), &std::free);
     return resolved ? std::string(resolved.get()) : path;
 }
 
-std::string folderOf(const std::string &path) {
-    const auto slash = path.rfind('/');
-    return slash == std::string::npos ? "" : path.substr(0, slash + 1);
-}
-
-/// A new file that removes itself unless it is renamed.
-class TemporaryFile {
-public:
-    TemporaryFile(const std::string &folder, mode_t permissions)
-        : _descriptor(create(folder, permissions, _path)) {}
-    TemporaryFile(const TemporaryFile &) = delete;
-    TemporaryFile &operator=(const TemporaryFile &) = delete;
-    ~TemporaryFile() {
-        if (!_path.empty())
-            ::unlink(_path.c_str());
-    }
-
-    void write(std::string_view contents, std::optional<mode_t> permissions) {
-        writeAll(_descriptor.number(), contents);
-        if (permissions && ::fchmod(_descriptor.number(), *permissions) != 0)
-            throw FileFailure("change the permissions", errno);
-        if (::fsync(_descriptor.number()) != 0)
-            throw FileFailure("write", errno);
-        _descriptor.close();
-    }
-
-    void renameTo(const std::string &path) {
-        if (::rename(_path.c_str(), path.c_str()) != 0)
-            throw FileFailure("rename", errno);
-        _path.clear();
-    }
-
-private:
-    static Descriptor create(const std::string &folder, mode_t permissions, std::string &path) {
-        const std::string stem = folder + ".zorvatouch-" + std::to_string(::getpid()) + "-";
-        for (int attempt = 0;; ++attempt) {
-            path = stem + std::to_string(attempt);
-            try {
-                return openFile(path, O_WRONLY | O_CREAT | O_EXCL, permissions);
-            } catch (const FileFailure &failure) {
-                path.clear();
-                if (failure.code().value() != EEXIST || attempt == 100)
-                    throw FileFailure("open a temporary file beside it", failure.code().value());
-            }
-        }
-    }
-
-    std::string _path;
-    Descriptor _descriptor;
-};
-
 /// @param permissions  Nothing: as the user wants new files.
-void writeAndRename(const std::string &target, std::string_view contents, std::optional<mode_t> permissions) {
+/// @param isVerified   The file is read again before it gets its name.
+void writeAndRename(const std::string &target, std::string_view contents, std::optional<mode_t> permissions,
+                    bool isVerified, const std::stop_token &abandoned) {
+    const SplitPath path(target);
+    const Folder folder(path.folder);
     // Until it has its permissions nobody else reads what they may keep from others.
-    TemporaryFile file(folderOf(target), permissions ? kForTheOwner : kForEverybody);
-    file.write(contents, permissions);
-    file.renameTo(target);
+    TemporaryFile file(folder, permissions ? kForTheOwner : kForEverybody);
+    file.write(contents, permissions, abandoned);
+    if (isVerified)
+        file.verify(contents);
+    file.renameTo(path.name);
 }
 
-/// @throws FileFailure  There is something that is no regular file.
-void requireRegularOrNothing(const std::string &path) {
-    struct stat status {};
-    if (::lstat(path.c_str(), &status) != 0 || S_ISREG(status.st_mode))
-        return; // what hinders us will say so when the file is made
-    if (S_ISDIR(status.st_mode))
-        throw FileFailure("replace", EISDIR);
-    throw FileFailure(S_ISLNK(status.st_mode) ? "replace a symbolic link" : "replace what is no regular file",
-                      EPERM);
+/// Whether this process may replace other users' files in folders with the sticky bit.
+bool mayReplaceForeignFiles() noexcept {
+    __user_cap_header_struct header{.version = _LINUX_CAPABILITY_VERSION_3, .pid = 0};
+    std::array<__user_cap_data_struct, _LINUX_CAPABILITY_U32S_3> sets{};
+    return ::syscall(SYS_capget, &header, sets.data()) == 0 &&
+           (sets[CAP_TO_INDEX(CAP_FOWNER)].effective & CAP_TO_MASK(CAP_FOWNER)) != 0;
+}
+
+/// @throws FileFailure  The file is another user's, and the folder keeps it for that user.
+void requireOurs(const std::string &path, const struct stat &file) {
+    const auto folder = statusOf(SplitPath(path).folder.empty() ? "." : SplitPath(path).folder);
+    if (!folder || (folder->st_mode & S_ISVTX) == 0)
+        return;
+    const uid_t user = ::geteuid();
+    if (file.st_uid != user && folder->st_uid != user && !mayReplaceForeignFiles())
+        throw FileFailure("replace another user's file in a folder with the sticky bit", EPERM);
 }
 
 } // namespace
@@ -204,23 +129,50 @@ void replaceFile(const std::string &path, std::string_view contents) {
         return;
     }
     writeAndRename(resolveLinks(path), contents,
-                   old ? std::optional<mode_t>(old->st_mode & 07777) : std::nullopt);
+                   old ? std::optional<mode_t>(old->st_mode & 07777) : std::nullopt, false, {});
 }
 
-void replacePrivateFile(const std::string &path, std::string_view contents) {
-    requireRegularOrNothing(path);
-    writeAndRename(path, contents, kForTheOwner);
+void replacePrivateFile(const std::string &path, std::string_view contents,
+                        const std::stop_token &abandoned) {
+    requireReplaceableName(path);
+    writeAndRename(path, contents, kForTheOwner, true, abandoned);
 }
 
 void requireReplaceable(const std::string &path) {
-    requireRegularOrNothing(path);
-    const TemporaryFile file(folderOf(path), kForTheOwner);
+    requireReplaceableName(path);
+    const Folder folder(SplitPath(path).folder);
+    const TemporaryFile file(folder, kForTheOwner);
+}
+
+void requireReplaceableName(const std::string &path) {
+    struct stat status {};
+    if (::lstat(path.c_str(), &status) != 0) {
+        if (errno == ENAMETOOLONG)
+            throw FileFailure("replace", errno);
+        return; // every other reason is found when the folder is opened
+    }
+    if (S_ISREG(status.st_mode))
+        return requireOurs(path, status);
+    if (S_ISDIR(status.st_mode))
+        throw FileFailure("replace", EISDIR);
+    throw FileFailure(S_ISLNK(status.st_mode) ? "replace a symbolic link" : "replace what is no regular file",
+                      EPERM);
+}
+
+void removeLeftovers(const std::string &path) noexcept {
+    try {
+        TemporaryFile::removeLeftovers(Folder(SplitPath(path).folder));
+    } catch (const std::exception &) { // a folder that cannot be opened keeps what is in it
+    }
 }
 
 void writeStandard(StandardStream stream, std::string_view text) { writeAll(static_cast<int>(stream), text); }
 
 bool isTerminal(StandardStream stream) noexcept { return ::isatty(static_cast<int>(stream)) == 1; }
 
-void reportBrokenPipes() noexcept { std::signal(SIGPIPE, SIG_IGN); }
+void reportFailedWrites() noexcept {
+    std::signal(SIGPIPE, SIG_IGN);
+    std::signal(SIGXFSZ, SIG_IGN);
+}
 
 } // namespace ZorvaTouch::Host

@@ -3,6 +3,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <functional>
+#include <stop_token>
 #include <string>
 #include <string_view>
 #include <system_error>
@@ -45,27 +46,39 @@ struct Input {
 /// @throws FileFailure
 [[nodiscard]] std::string readAll(const Input &input);
 
-/// Gives a file new contents: they are written to a temporary file in the same folder, flushed to the disk
-/// and renamed, so that under `path` there is always the whole old file or the whole new one. An existing
-/// file keeps its permissions, a symbolic link keeps pointing at it. What is no regular file (a pipe, a
-/// device) is written to as it is.
+/// Gives a file new contents: they are written to a temporary file of a random name in the same folder,
+/// flushed to the disk and renamed, and the folder is flushed, so that under `path` there is always the whole
+/// old file or the whole new one. An existing file keeps its permissions, a symbolic link keeps pointing at
+/// it. What is no regular file (a pipe, a device) is written to as it is.
 /// @throws FileFailure  The temporary file is gone then.
 void replaceFile(const std::string &path, std::string_view contents);
 
-/// The same for contents that are nobody else's business: the file is readable and writable for its owner and
-/// for nobody else, from its first byte on and whatever an older file's permissions were.
+/// Gives a file new contents that only its owner may read: it has the mode 0600 from its first byte on,
+/// whatever an older file's permissions were, and is read again and compared before it gets its name.
 ///
-/// Only a regular file is replaced. What else is there is refused, a symbolic link too: the program may have
-/// more rights than whoever can put a link into that folder. One that gets there at the last moment is
-/// replaced, and what it points at stays as it is. The folders on the way to the file are whoever's who named
-/// it.
-/// @throws FileFailure  As above; EPERM for what is no regular file, EISDIR for a folder.
-void replacePrivateFile(const std::string &path, std::string_view contents);
+/// Only a regular file is replaced. Anything else there is refused, a symbolic link too: the program may have
+/// more rights than the user who can put a link into that folder. A link that gets there at the last moment
+/// is replaced, and what it points at stays as it is. No name is opened that another program may have
+/// exchanged, so a FIFO in the place of the file cannot block the call. Parent directories are used as given.
+/// @param abandoned  Once it is requested, the call ends as soon as the system lets it, and throws ECANCELED.
+/// @throws FileFailure  As above; EPERM for anything but a regular file, EISDIR for a folder, EBUSY if
+///                      another program exchanged the file while it got its name.
+void replacePrivateFile(const std::string &path, std::string_view contents,
+                        const std::stop_token &abandoned = {});
 
-/// Whether `replacePrivateFile` can make the file, as far as that can be told beforehand. Leaves everything
-/// as it is.
+/// Checks whether `replacePrivateFile` can make the file, as far as that can be found out beforehand. Leaves
+/// everything as it is.
 /// @throws FileFailure  What it would throw.
 void requireReplaceable(const std::string &path);
+
+/// The part of it that depends on the name, and on the file that has it, alone: for further names in a
+/// folder.
+/// @throws FileFailure
+void requireReplaceableName(const std::string &path);
+
+/// Removes temporary files that killed processes of this user have left behind in the folder of a file. A
+/// file that a process is still writing stays. Failures are ignored.
+void removeLeftovers(const std::string &path) noexcept;
 
 /// Writes everything.
 /// @throws FileFailure
@@ -74,7 +87,8 @@ void writeStandard(StandardStream stream, std::string_view text);
 /// Whether a person watches: the stream is a terminal.
 [[nodiscard]] bool isTerminal(StandardStream stream) noexcept;
 
-/// Makes a write to a pipe that nobody reads fail with EPIPE instead of ending the process without a word.
-void reportBrokenPipes() noexcept;
+/// Makes writes fail with an error in place of a signal that ends the process: EPIPE for a pipe without a
+/// reader, EFBIG for a file beyond the limit on its size (`ulimit -f`, LimitFSIZE=).
+void reportFailedWrites() noexcept;
 
 } // namespace ZorvaTouch::Host

@@ -56,7 +56,7 @@ std::vector<std::string> argumentsOf(int count, char **values) {
 } // namespace
 
 int main(int argc, char **argv) {
-    Host::reportBrokenPipes();
+    Host::reportFailedWrites();
     StandardSink output(Host::StandardStream::Output);
     StandardSink errorOutput(Host::StandardStream::Error);
     Host::SteadyClock clock;

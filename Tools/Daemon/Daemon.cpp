@@ -3,6 +3,7 @@
 #include "Host/Linux/RealTime.h"
 #include "Host/Linux/StartUpCode.h"
 #include "Host/Linux/TrustedFile.h"
+#include "Host/Runtime/Files.h"
 #include "Shared/LogNames.h"
 #include "Shared/Util/Ticks.h"
 #include "Tools/Daemon/DaemonChoices.h"
@@ -65,8 +66,10 @@ Daemon::Daemon(const DaemonOptions &options, DaemonSurroundings surroundings)
                  .onEnding = [this](const SurfaceName &name,
                                     const Surface &surface) { _recordings.save(name, surface); }}) {
     requireNodes(deviceFilterOf(_options));
-    if (_options.saveFile)
+    if (_options.saveFile) {
+        Host::removeLeftovers(*_options.saveFile);
         requireSavable(*_options.saveFile); // rather now than when it is too late
+    }
     watchAccelerometers();
     startSimulations();
     watchDevices();

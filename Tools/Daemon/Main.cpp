@@ -120,7 +120,7 @@ int fail(const std::exception &error, ExitStatus status) {
 
 int main(int argc, char **argv) {
     Linux::fillStandardStreams();
-    Host::reportBrokenPipes();
+    Host::reportFailedWrites();
     try {
         const auto command = Tools::parseDaemonOptions(std::vector<std::string>(argv + 1, argv + argc));
         if (const auto *const answer = std::get_if<Tools::AnswerOptions>(&command)) {

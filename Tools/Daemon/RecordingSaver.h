@@ -26,8 +26,8 @@ public:
 void requireSavable(const std::string &file);
 
 /// Saves a recording, for nobody but its owner: it shows what somebody did. An older file is replaced only
-/// when the new one is complete; what is no regular file is not replaced, nor is a symbolic link followed.
-/// Then it is read again and compared.
+/// when the new one is complete, and has been read again and compared; what is no regular file is not
+/// replaced, nor is a symbolic link followed.
 /// @param text  What the service's property "Recording" gives.
 /// @return The input reports in it.
 /// @throws SavingError, std::bad_alloc

@@ -3,12 +3,16 @@
 #include <gtest/gtest.h>
 
 #include <fcntl.h>
+#include <sys/file.h>
+#include <sys/resource.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
 #include <cerrno>
 #include <filesystem>
 #include <functional>
+#include <stop_token>
+#include <string>
 
 namespace ZorvaTouch::Host {
 namespace {
@@ -171,8 +175,88 @@ TEST_F(Files, WhatCannotBeReplacedIsToldBeforehand) {
     EXPECT_EQ(fileCount(), 2u);
 }
 
+TEST_F(Files, ANameThatIsTooLongIsToldBeforehand) {
+    EXPECT_EQ(failureOf([this] { requireReplaceable(path(std::string(255, 'a'))); }), "none");
+    EXPECT_EQ(failureOf([this] { requireReplaceable(path(std::string(256, 'a'))); }),
+              "replace: File name too long");
+}
+
+/// Another user's file, as that user's own process sees it.
+TEST_F(Files, AnotherUsersFileInAStickyFolderIsToldBeforehand) {
+    if (::geteuid() != 0)
+        GTEST_SKIP() << "only root can be two users";
+    constexpr uid_t kUser = 65534;
+    replaceFile(path("foreign"), "1");
+    replaceFile(path("own"), "1");
+    ASSERT_EQ(::chown(path("own").c_str(), kUser, kUser), 0);
+    ASSERT_EQ(::chmod(_folder.c_str(), 01777), 0);
+    EXPECT_EQ(failureOf([this] { requireReplaceable(path("own")); }), "none") << "root may";
+    ASSERT_EQ(::seteuid(kUser), 0);
+    const std::string foreign = failureOf([this] { requireReplaceable(path("foreign")); });
+    const std::string own = failureOf([this] { requireReplaceable(path("own")); });
+    const std::string saved = failureOf([this] { replacePrivateFile(path("foreign"), "2"); });
+    ASSERT_EQ(::seteuid(0), 0);
+    EXPECT_EQ(foreign,
+              "replace another user's file in a folder with the sticky bit: Operation not permitted");
+    EXPECT_EQ(saved, foreign);
+    EXPECT_EQ(own, "none");
+}
+
+TEST_F(Files, NamesThatWereTakenBeforehandDoNotHinder) {
+    for (int i = 0; i <= 100; ++i)
+        replaceFile(path(".zorvatouch-" + std::to_string(::getpid()) + "-" + std::to_string(i)), "planted");
+    replacePrivateFile(path("a"), "1");
+    EXPECT_EQ(readFile(path("a")), "1");
+}
+
+TEST_F(Files, AFileBeyondTheLimitIsAnErrorAndLeavesNothing) {
+    reportFailedWrites();
+    rlimit before{};
+    ASSERT_EQ(::getrlimit(RLIMIT_FSIZE, &before), 0);
+    rlimit limited = before;
+    limited.rlim_cur = 100'000;
+    replaceFile(path("a"), "older");
+    ASSERT_EQ(::setrlimit(RLIMIT_FSIZE, &limited), 0);
+    const std::string failure =
+        failureOf([this] { replacePrivateFile(path("a"), std::string(100'001, 'x')); });
+    ASSERT_EQ(::setrlimit(RLIMIT_FSIZE, &before), 0);
+    EXPECT_EQ(failure, "write: File too large");
+    EXPECT_EQ(readFile(path("a")), "older");
+    EXPECT_EQ(fileCount(), 1u);
+}
+
+TEST_F(Files, AnAbandonedFileLeavesNothing) {
+    replaceFile(path("a"), "older");
+    std::stop_source abandoned;
+    abandoned.request_stop();
+    EXPECT_EQ(failureOf([&] { replacePrivateFile(path("a"), "newer", abandoned.get_token()); }),
+              "write: Operation canceled");
+    EXPECT_EQ(readFile(path("a")), "older");
+    EXPECT_EQ(fileCount(), 1u);
+}
+
+TEST_F(Files, OnlyLeftoversThatNobodyWritesAreRemoved) {
+    const std::string left = ".zorvatouch-0123456789abcdef", written = ".zorvatouch-fedcba9876543210";
+    replaceFile(path(left), "left");
+    replaceFile(path(written), "written");
+    replaceFile(path(".zorvatouch-0123456789abcdeF"), "another's name");
+    replaceFile(path("a"), "1");
+    ASSERT_EQ(::symlink("a", path(".zorvatouch-0000000000000000").c_str()), 0);
+    ASSERT_EQ(::mkfifo(path(".zorvatouch-0000000000000001").c_str(), 0600), 0);
+    const int writer = ::open(path(written).c_str(), O_WRONLY | O_CLOEXEC);
+    ASSERT_EQ(::flock(writer, LOCK_EX), 0);
+    removeLeftovers(path("a"));
+    EXPECT_FALSE(std::filesystem::exists(path(left)));
+    EXPECT_EQ(fileCount(), 5u);
+    ::close(writer);
+    removeLeftovers(path("a"));
+    EXPECT_FALSE(std::filesystem::exists(path(written)));
+    EXPECT_EQ(fileCount(), 4u);
+    removeLeftovers(path("no/a")); // nothing to be done
+}
+
 TEST_F(Files, ABrokenPipeIsReported) {
-    reportBrokenPipes();
+    reportFailedWrites();
     int ends[2];
     ASSERT_EQ(::pipe(ends), 0);
     ASSERT_EQ(::close(ends[0]), 0);

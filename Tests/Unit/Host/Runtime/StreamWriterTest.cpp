@@ -23,7 +23,7 @@ constexpr std::size_t kTooMuch = 8 * 1024 * 1024;
 class StreamWriterTest : public ::testing::Test {
 protected:
     void SetUp() override {
-        reportBrokenPipes();
+        reportFailedWrites();
         std::fflush(stdout);
         _saved = ::dup(STDOUT_FILENO);
         ASSERT_GE(_saved, 0);

@@ -4,11 +4,16 @@
 
 #include <gtest/gtest.h>
 
+#include <fcntl.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <atomic>
+#include <cstdio>
 #include <filesystem>
 #include <string>
+#include <thread>
+#include <utility>
 
 namespace ZorvaTouch::Tools {
 namespace {
@@ -81,6 +86,58 @@ TEST_F(RecordingSaver, ALinkIsNotFollowed) {
     EXPECT_EQ(problemWith(path("a.json"), kTwoReports),
               "@/a.json: cannot replace a symbolic link: Operation not permitted");
     EXPECT_EQ(Host::readFile(path("precious")), "x");
+}
+
+/// The owner of the folder, who exchanges a file and a FIFO again and again.
+class Exchanger {
+public:
+    Exchanger(std::string left, std::string right)
+        : _left(std::move(left)), _right(std::move(right)), _thread([this] { exchange(); }) {}
+    ~Exchanger() { finish(); }
+
+    void finish() {
+        _isOver = true;
+        if (_thread.joinable())
+            _thread.join();
+    }
+    /// Readers that were found waiting for somebody to open the FIFO for writing.
+    [[nodiscard]] unsigned caught() const noexcept { return _caught; }
+
+private:
+    void exchange() {
+        while (!_isOver) {
+            ::renameat2(AT_FDCWD, _left.c_str(), AT_FDCWD, _right.c_str(), RENAME_EXCHANGE);
+            release(_left);
+            release(_right);
+        }
+    }
+    /// Opens a FIFO for writing, which fails unless somebody waits in its opening for reading.
+    void release(const std::string &path) {
+        const int number = ::open(path.c_str(), O_WRONLY | O_NONBLOCK | O_NOFOLLOW | O_CLOEXEC);
+        if (number < 0)
+            return;
+        struct stat status {};
+        if (::fstat(number, &status) == 0 && S_ISFIFO(status.st_mode))
+            ++_caught;
+        ::close(number);
+    }
+
+    const std::string _left, _right;
+    std::atomic<bool> _isOver = false;
+    std::atomic<unsigned> _caught = 0;
+    std::thread _thread;
+};
+
+TEST_F(RecordingSaver, IsNotBlockedByAFifoThatIsExchangedForTheFile) {
+    ASSERT_EQ(::mkfifo(path("pipe").c_str(), 0600), 0);
+    Host::replaceFile(path("a.json"), "older");
+    Exchanger opponent(path("a.json"), path("pipe"));
+    unsigned saved = 0;
+    for (int i = 0; i < 400; ++i)
+        saved += problemWith(path("a.json"), kTwoReports).empty() ? 1 : 0;
+    opponent.finish();
+    EXPECT_EQ(opponent.caught(), 0u);
+    EXPECT_GT(saved, 0u);
 }
 
 TEST_F(RecordingSaver, WhatCannotBeSavedIsToldAtTheStart) {
