@@ -69,7 +69,7 @@ void HidrawDevice::deliver(const Callback &callback, std::size_t length) noexcep
         ++_counters.reports;
     }
     if (_observer)
-        _observer->onReport();
+        _observer->onReport(timestamp, callback.buffer.first(length));
     const std::uint8_t *const report = callback.buffer.data();
     callback.function(callback.context, ZORVA_STATUS_SUCCESS, this, kInputReportType, report[0], report,
                       length, timestamp);

@@ -31,7 +31,9 @@ public:
     /// Opening failed, or one read did.
     virtual void onFailure(const SystemFailure &failure) noexcept = 0;
     /// A report is about to be handed to the callback. Must be quick.
-    virtual void onReport() noexcept {}
+    /// @param timestamp  Host ticks.
+    /// @param report     Report ID first. Borrowed for the call.
+    virtual void onReport(std::uint64_t /*timestamp*/, std::span<const std::uint8_t> /*report*/) noexcept {}
     /// The device was taken off its run loop: whoever had scheduled it, or scheduled it anew, listens no
     /// more.
     virtual void onUnscheduled() noexcept {}

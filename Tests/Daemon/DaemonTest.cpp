@@ -8,6 +8,7 @@
 
 #include <cerrno>
 #include <csignal>
+#include <filesystem>
 #include <stdexcept>
 #include <string>
 
@@ -159,6 +160,60 @@ TEST_F(DaemonTest, SavesWhenToldToAndGoesOn) {
     EXPECT_EQ(readRecordingContainer(Host::readFile(folder.path("touch.json"))).version, 2u);
     EXPECT_THAT(linesWith("\"file\":\"" + folder.path("touch-2.json") + "\",\"surface\":\"sim:idle-2\""),
                 Not(IsEmpty()));
+}
+
+TEST_F(DaemonTest, ARecordingThatIsLostIsAFailure) {
+    const Tests::TemporaryFolder folder;
+    options.saveFile = folder.path("touch.json");
+    addFinger("idle", 0.2);
+    start();
+    daemon->run();
+    std::filesystem::create_directory(folder.path("touch.json"));
+    EXPECT_FALSE(daemon->end());
+    EXPECT_FALSE(daemon->isStuck());
+    EXPECT_EQ(logs.lines().count("touch.json: cannot replace: Is a directory"), 1u);
+}
+
+TEST_F(DaemonTest, ARecordingThatIsSavedIsNone) {
+    const Tests::TemporaryFolder folder;
+    options.saveFile = folder.path("touch.json");
+    addFinger("idle", 0.2);
+    start();
+    daemon->run();
+    EXPECT_TRUE(daemon->end());
+    EXPECT_THAT(linesWith("\"type\":\"recording\""), SizeIs(1));
+}
+
+TEST_F(DaemonTest, WhatCannotBeSavedInTheEndIsFoundAtTheStart) {
+    const Tests::TemporaryFolder folder;
+    options.saveFile = folder.path("touch.json");
+    std::filesystem::create_directory(folder.path("touch-2.json"));
+    addFinger("idle", 0.2);
+    EXPECT_EQ(problem(), folder.path("touch-2.json") + ": cannot replace: Is a directory");
+    options.saveLimits.count = 1;
+    EXPECT_EQ(problem(), "");
+}
+
+TEST_F(DaemonTest, TemporaryFilesOfKilledDaemonsAreRemovedAtTheStart) {
+    const Tests::TemporaryFolder folder;
+    options.saveFile = folder.path("touch.json");
+    Host::replaceFile(folder.path(".zorvatouch-0123456789abcdef"), "left");
+    addFinger("idle", 0.2);
+    start();
+    EXPECT_FALSE(std::filesystem::exists(folder.path(".zorvatouch-0123456789abcdef")));
+}
+
+TEST_F(DaemonTest, ARecordingHasWhatItWasMadeWith) {
+    const Tests::TemporaryFolder folder;
+    options.saveFile = folder.path("touch.json");
+    addFinger("taps", 0.95);
+    runToTheEnd();
+    const FrameList frames = readRecordingContainer(Host::readFile(folder.path("touch.json"))).frames;
+    std::string keys;
+    for (const FrameView &frame : frames)
+        if (frame.type == FrameType::Metadata && frame.key != "Accel")
+            keys.append(frame.key).append(" ");
+    EXPECT_EQ(keys, "Device Software Tunables ");
 }
 
 // --- What it does not wait for

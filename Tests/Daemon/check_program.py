@@ -1,7 +1,8 @@
 #!/usr/bin/python3
 """Checks the daemon as others start it: what it is told, what it says, and how it ends.
 
-    check_program.py PROGRAM SCHEMA    SCHEMA is that of a line of `--events json`
+    check_program.py PROGRAM SCHEMA RECORDING    SCHEMA is that of a line of `--events json`, RECORDING that of
+                                                 a recording
 
 No surface is needed: all of it is simulated. Every wait is for the thing itself, and fails after a while.
 """
@@ -9,6 +10,7 @@ No surface is needed: all of it is simulated. Every wait is for the thing itself
 import json
 import os
 import pathlib
+import resource
 import signal
 import subprocess
 import sys
@@ -164,6 +166,41 @@ class Finger(unittest.TestCase):
         self.assertEqual([line.split()[-1] for line in done.stdout.splitlines()], ["is", "down", "up"])
 
 
+class Saving(unittest.TestCase):
+    def setUp(self):
+        folder = tempfile.TemporaryDirectory()
+        self.addCleanup(folder.cleanup)
+        self.folder = folder.name
+        self.file = os.path.join(folder.name, "touch.json")
+
+    def test_a_recording_that_is_lost_is_status_1(self):
+        with Running(*ENDLESS, "--save", self.file) as daemon:
+            daemon.line_with('"opened"')
+            os.mkdir(self.file)
+            self.assertEqual(daemon.end_by(signal.SIGTERM)[0], 1)
+
+    def test_a_limit_on_files_is_an_error_and_leaves_none(self):
+        def limit():
+            resource.setrlimit(resource.RLIMIT_FSIZE, (1000, resource.RLIM_INFINITY))
+
+        with Running(*ENDLESS, "--save", self.file, preexec_fn=limit) as daemon:
+            daemon.line_with('"may-begin"')
+            self.assertEqual(daemon.end_by(signal.SIGTERM)[0], 1)
+        self.assertEqual(os.listdir(self.folder), [])
+
+    def test_other_programs_read_what_it_was_made_with(self):
+        done = run(*ENDLESS, "--duration", "0.3", "--save", self.file)
+        self.assertEqual(done.returncode, 0, done.stderr)
+        with open(self.file, encoding="utf-8") as file:
+            recording = json.load(file)
+        jsonschema.Draft7Validator(RECORDING_SCHEMA).validate(recording)
+        notes = {frame["Key"]: frame["Value"] for frame in recording["Frames"] if frame["Type"] == "Metadata"}
+        self.assertEqual(notes["Device"], {"Name": "Simulated touch sensor", "ProductID": 0xABCD,
+                                           "VendorID": 0x1234})
+        self.assertEqual(notes["Tunables"], {})
+        self.assertEqual(sorted(notes["Software"]), ["Program", "Service"])
+
+
 class End(unittest.TestCase):
     def test_each_signal_ends_it_with_0_at_once(self):
         for number in (signal.SIGTERM, signal.SIGINT, signal.SIGHUP, signal.SIGQUIT, signal.SIGALRM,
@@ -305,5 +342,6 @@ class Streams(unittest.TestCase):
 
 if __name__ == "__main__":
     PROGRAM = sys.argv.pop(1)
-    SCHEMA = json.loads(pathlib.Path(sys.argv.pop(1)).read_text(encoding="utf-8"))
+    SCHEMA, RECORDING_SCHEMA = (json.loads(pathlib.Path(sys.argv.pop(1)).read_text(encoding="utf-8"))
+                                for _ in range(2))
     unittest.main()

@@ -49,7 +49,7 @@ Daemon::Daemon(const DaemonOptions &options, DaemonSurroundings surroundings)
       _keyboard(pressesKeys(options) ? _surroundings.keyboard : nullptr, *_listener,
                 DaemonLog(*_logs, "Keys")),
       _shownKeys(nullptr, *_listener, DaemonLog(*_logs, "Keys")), _events(Host::EventSystem::create()),
-      _recordings(options.saveFile, *_listener, DaemonLog(*_logs, "Recordings")),
+      _recordings(options.saveFile, options.saveLimits, *_listener, DaemonLog(*_logs, "Recordings"), _loop),
       _signals(kSignals, [this](int signal) { handleSignal(signal); }),
       _surfaces({.plugIn = _plugIn,
                  .events = _events,
@@ -60,15 +60,16 @@ Daemon::Daemon(const DaemonOptions &options, DaemonSurroundings surroundings)
                               .ticks = Util::TickConverter(_surroundings.clock)},
                  .listener = *_listener,
                  .loop = _loop,
-                 .log = DaemonLog(*_logs, "Surfaces")},
+                 .log = DaemonLog(*_logs, "Surfaces"),
+                 .savesSerial = options.savesSerial},
                 _surroundings.finder, _surroundings.clock,
                 {.onComing = [this](const SurfaceName &name) { _recordings.expect(name); },
                  .onEnding = [this](const SurfaceName &name,
-                                    const Surface &surface) { _recordings.save(name, surface); }}) {
+                                    const Surface &surface) { _recordings.finish(name, surface); }}) {
     requireNodes(deviceFilterOf(_options));
     if (_options.saveFile) {
         Host::removeLeftovers(*_options.saveFile);
-        requireSavable(*_options.saveFile); // rather now than when it is too late
+        requireSavable(_recordings.files()); // rather now than when it is too late
     }
     watchAccelerometers();
     startSimulations();
@@ -77,10 +78,18 @@ Daemon::Daemon(const DaemonOptions &options, DaemonSurroundings surroundings)
 }
 
 Daemon::~Daemon() {
+    end();
     _watches.clear(); // before what they watch
+}
+
+bool Daemon::end() {
+    if (std::exchange(_hasEnded, true))
+        return !_recordings.hasFailed();
     _surfaces.closeAll();
     _keyQueue.drain(); // it may still be about to plug in the keyboard, which goes before it
+    _recordings.wait();
     _stream.finish();
+    return !_recordings.hasFailed();
 }
 
 std::shared_ptr<Linux::RateLimitedLogs> Daemon::makeLogs() {

@@ -56,7 +56,7 @@ public:
     /// @param options, surroundings  The first is borrowed.
     /// @throws std::runtime_error  It cannot work at all, with the reason in one line.
     Daemon(const DaemonOptions &options, DaemonSurroundings surroundings);
-    /// Every key goes up, and recordings that are wanted are saved.
+    /// Ends, if that has not happened yet.
     ~Daemon();
     Daemon(const Daemon &) = delete;
     Daemon &operator=(const Daemon &) = delete;
@@ -66,6 +66,13 @@ public:
     ///                       options do not say to wait for it.
     /// @throws std::runtime_error
     void run();
+
+    /// Lets every key go up, and then waits until recordings that are wanted are saved. Once.
+    /// @return Whether they all were.
+    bool end();
+    /// Whether saving was given up and the system has not let a write end: the destructor waits until it
+    /// does.
+    [[nodiscard]] bool isStuck() const { return _hasEnded && _recordings.isBusy(); }
 
 private:
     [[nodiscard]] std::shared_ptr<const Host::PlugInFile> loadPlugIn() const;
@@ -109,6 +116,7 @@ private:
     RecordingKeeper _recordings;
     EndRequests _endRequests; ///< the signal thread's
     Host::SignalWatch _signals;
+    bool _hasEnded = false;
     Surfaces _surfaces;
     std::optional<Linux::AccelHub> _accelHub;
     std::optional<Linux::AccelIdentity> _accelerometer; ///< the one that is used

@@ -17,6 +17,7 @@ namespace {
 
 constexpr const char *kProgram = "zorvatouchd";
 constexpr const char *kHint = " (see zorvatouchd --help)";
+constexpr std::size_t kMostRecordings = 1000; ///< each name is checked at the start
 constexpr std::string_view kFingerPrefix = "sim:";
 
 constexpr const char *kDescription =
@@ -39,7 +40,7 @@ Signals:
 
 Exit status:
   0  ended by a signal, or with the simulated finger
-  1  the plug-in cannot be loaded, or nothing can work
+  1  the plug-in cannot be loaded, nothing can work, or a recording was lost
   2  bad usage
   3  another program uses a surface, as a second zorvatouchd does; see --wait
 )";
@@ -222,7 +223,12 @@ private:
                   "json          a line of JSON for each event");
         addOption(kGroup, "--save", _save, "FILE",
                   "Write the recording at the end and at SIGUSR1, for its owner only\n"
-                  "Further surfaces' go to FILE with -2, -3 before its ending");
+                  "Further recordings go to FILE with -2, -3 before its ending");
+        addOption(kGroup, "--save-count", _saveCount, "N",
+                  "Files of recordings, at most; the oldest goes first (default: 16)");
+        addOption(kGroup, "--save-bytes", _saveBytes, "N",
+                  "Bytes of all of them, at most (default: 67108864, 64 MiB)");
+        addFlag(kGroup, "--save-serial", _savesSerial, "Note the surface's serial number in recordings");
         addOption(kGroup, "--log-level", _logLevel, "LEVEL",
                   "Log from this level on: error, default (unless given), debug");
         addFlag(kGroup, "--describe", _describe, "Say as JSON what is there, and exit");
@@ -338,10 +344,24 @@ private:
         if (_save)
             requireFileName("--save", *_save);
         options.saveFile = _save;
+        readSaving(options);
         if (_logLevel)
             options.logLevel = parseLogLevel(*_logLevel);
         if (_plugIn)
             requireFileName("--plugin", *_plugIn);
+    }
+
+    void readSaving(DaemonOptions &options) const {
+        if (!_save && (_saveCount || _saveBytes || _savesSerial))
+            throw CliError("--save-count, --save-bytes and --save-serial need --save FILE");
+        if (_saveCount)
+            options.saveLimits.count = parseCount("--save-count", *_saveCount, 1);
+        if (options.saveLimits.count > kMostRecordings)
+            throw CliError("--save-count: '" + *_saveCount + "': must be an integer from 1 to " +
+                           std::to_string(kMostRecordings));
+        if (_saveBytes)
+            options.saveLimits.bytes = parseCount("--save-bytes", *_saveBytes, 1);
+        options.savesSerial = _savesSerial;
     }
 
     /// Options that have no meaning where nothing runs.
@@ -362,8 +382,9 @@ private:
     CLI::App _app;
     // As typed.
     std::vector<std::string> _devices, _ids, _maps;
-    std::optional<std::string> _seed, _duration, _accel, _events, _save, _logLevel, _plugIn, _keyLimit;
-    bool _keys = false, _noKeys = false, _describe = false, _wait = false;
+    std::optional<std::string> _seed, _duration, _accel, _events, _save, _saveCount, _saveBytes, _logLevel,
+        _plugIn, _keyLimit;
+    bool _keys = false, _noKeys = false, _describe = false, _wait = false, _savesSerial = false;
 };
 
 } // namespace

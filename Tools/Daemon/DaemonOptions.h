@@ -5,6 +5,7 @@
 #include "Tools/Cli/Options.h"
 #include "Tools/Daemon/KeyMap.h"
 #include "Tools/Daemon/KeyQuarantine.h"
+#include "Tools/Daemon/RecordingFiles.h"
 #include "Tools/Hosting/FingerSource.h"
 
 #include <optional>
@@ -44,6 +45,8 @@ struct DaemonOptions {
     bool waits = false;    ///< for surfaces that another program uses, rather than ending
     bool describe = false; ///< says what is there, and that is all
     std::optional<std::string> saveFile;
+    RecordingLimits saveLimits;
+    bool savesSerial = false; ///< recordings have the surface's serial number
     Ports::LogLevel logLevel = Ports::LogLevel::Default;
     std::optional<std::string> plugIn; ///< nothing: the one beside the program
 };

@@ -14,6 +14,7 @@
 #include "Tools/Hosting/ProgramFolder.h"
 
 #include <cstdint>
+#include <cstdlib>
 #include <exception>
 #include <memory>
 #include <string>
@@ -87,7 +88,10 @@ int runDaemon(const Tools::DaemonOptions &options) {
                  return makerFor(Linux::openLocked(openerOf(device)));
              }});
     daemon.run();
-    return kExitEnded;
+    const bool hasSaved = daemon.end();
+    if (daemon.isStuck())
+        std::_Exit(kExitFailed); // every key is up, and nothing else is left to be done
+    return hasSaved ? kExitEnded : kExitFailed;
 }
 
 /// @throws Host::FileFailure

@@ -37,6 +37,9 @@ public:
     void play();
 
 private:
+    /// Who is notified of the device's reports, since the device itself notifies nobody.
+    class Observers;
+
     [[nodiscard]] Simulated::FrameSource frames();
 
     const SimulatedFinger _finger;
@@ -45,6 +48,7 @@ private:
     const std::shared_ptr<Host::EventSystem> _events;
     const Ref<Simulated::Device> _device;
     const std::shared_ptr<bool> _isThere; ///< for what is posted and comes too late
+    const std::shared_ptr<Observers> _observers;
     Simulated::Player _player;
 };
 

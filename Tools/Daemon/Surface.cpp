@@ -96,10 +96,15 @@ void Surface::checkSilence() {
 
 void Surface::suspend() { letGo(SurfaceEnd::Suspended); }
 
-std::optional<std::string> Surface::recording() const {
+std::optional<SurfaceRecording> Surface::recording() const {
     const auto recording = _service->property("Recording");
     const std::string *const text = recording ? recording->asString() : nullptr;
-    return text ? std::optional(*text) : std::nullopt;
+    if (!text)
+        return std::nullopt;
+    return SurfaceRecording{.text = *text,
+                            .history = _observer->history(),
+                            .notes = notesOf(*_service, _surroundings.savesSerial),
+                            .timeNs = _observer->nowNs()};
 }
 
 } // namespace ZorvaTouch::Tools

@@ -4,6 +4,7 @@
 #include "Host/Linux/MainLoop.h"
 #include "Host/Objects/EventSystem.h"
 #include "Host/Runtime/SerialQueue.h"
+#include "Tools/Daemon/RecordingSaver.h"
 #include "Tools/Daemon/SurfaceKeys.h"
 #include "Tools/Hosting/HostedService.h"
 
@@ -32,6 +33,7 @@ struct SurfaceSurroundings {
     Linux::MainLoop &loop;
     DaemonLog log;
     Linux::LoopTimer after = {}; ///< empty: the loop's own
+    bool savesSerial = false;    ///< recordings have the surface's serial number
 
     [[nodiscard]] Linux::LoopWatch later(std::chrono::milliseconds delay, std::function<void()> function) {
         return after ? after(delay, std::move(function)) : loop.after(delay, std::move(function));
@@ -83,7 +85,8 @@ public:
     /// Whether no touch goes on that may still do something.
     [[nodiscard]] bool isIdle() const noexcept { return _keys->isIdle(); }
     /// The recording so far; nothing if the service has none.
-    [[nodiscard]] std::optional<std::string> recording() const;
+    /// @throws std::bad_alloc
+    [[nodiscard]] std::optional<SurfaceRecording> recording() const;
 
 private:
     class Observer;

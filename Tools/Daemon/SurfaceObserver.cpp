@@ -1,5 +1,7 @@
 #include "Tools/Daemon/SurfaceObserver.h"
 
+#include "Host/Interface/Platform.h"
+
 #include <exception>
 #include <string_view>
 #include <utility>
@@ -9,7 +11,8 @@ namespace ZorvaTouch::Tools {
 using Host::MutexLock;
 
 Surface::Observer::Observer(SurfaceSurroundings &surroundings, OnLost onLost, std::function<void()> onHeld)
-    : _surroundings(surroundings), _onHeld(std::move(onHeld)), _onLost(std::move(onLost)) {}
+    : _surroundings(surroundings), _clock(Host::processPlatform().clock()), _ticks(_clock),
+      _onHeld(std::move(onHeld)), _onLost(std::move(onLost)) {}
 
 void Surface::Observer::begin(std::shared_ptr<SurfaceKeys> keys) {
     std::optional<Linux::SystemFailure> goneFor;

@@ -1,5 +1,7 @@
 #pragma once
 
+#include "Shared/Util/Ticks.h"
+#include "Tools/Daemon/ReportHistory.h"
 #include "Tools/Daemon/Surface.h"
 
 #include <atomic>
@@ -7,6 +9,8 @@
 #include <functional>
 #include <memory>
 #include <optional>
+#include <span>
+#include <string>
 
 namespace ZorvaTouch::Tools {
 
@@ -40,7 +44,17 @@ public:
     /// That the device has handed over so far.
     [[nodiscard]] std::uint64_t reports() const noexcept { return _reports.load(std::memory_order_relaxed); }
 
-    void onReport() noexcept override { _reports.fetch_add(1, std::memory_order_relaxed); }
+    /// The newest reports that the device has handed over.
+    /// @throws std::bad_alloc
+    [[nodiscard]] FrameList history() const { return _history.reports(); }
+    [[nodiscard]] std::uint64_t nowNs() const noexcept {
+        return _ticks.nanosecondsFromMachTime(_clock.nowTicks());
+    }
+
+    void onReport(std::uint64_t timestamp, std::span<const std::uint8_t> report) noexcept override {
+        _reports.fetch_add(1, std::memory_order_relaxed);
+        _history.add(_ticks.nanosecondsFromMachTime(timestamp), report);
+    }
     void onGone(const Linux::SystemFailure &reason) noexcept override;
     void onFailure(const Linux::SystemFailure &failure) noexcept override;
     void onUnscheduled() noexcept override;
@@ -49,7 +63,10 @@ private:
     void lose(SurfaceEnd end, const char *what, const Linux::SystemFailure *why) noexcept;
 
     SurfaceSurroundings &_surroundings;
+    Ports::Clock &_clock; ///< the process's, as the plug-in has it
+    const Util::TickConverter _ticks;
     std::atomic<std::uint64_t> _reports{0};
+    ReportHistory _history;
     std::function<void()> _onHeld; ///< the main thread's; empty when nobody wants to hear
     OnLost _onLost;                ///< the main thread's; empty once it was called or nobody wants to hear
 

@@ -63,6 +63,9 @@ TEST(DaemonOptions, WithoutAnyItPressesKeysForWhatIsFound) {
     EXPECT_FALSE(options.describe);
     EXPECT_FALSE(options.waits);
     EXPECT_EQ(options.saveFile, std::nullopt);
+    EXPECT_EQ(options.saveLimits.count, 16u);
+    EXPECT_EQ(options.saveLimits.bytes, 67'108'864u);
+    EXPECT_FALSE(options.savesSerial);
     EXPECT_EQ(options.logLevel, Ports::LogLevel::Default);
     EXPECT_EQ(options.plugIn, std::nullopt);
 }
@@ -154,6 +157,15 @@ TEST(DaemonOptions, TheRestIsUnderstoodInAnyOrder) {
     } while (std::next_permutation(parts.begin(), parts.end()));
 }
 
+TEST(DaemonOptions, RecordingsHaveLimits) {
+    const DaemonOptions options =
+        optionsOf({"--save", "a", "--save-count", "3", "--save-bytes", "1000", "--save-serial"});
+    EXPECT_EQ(options.saveLimits.count, 3u);
+    EXPECT_EQ(options.saveLimits.bytes, 1000u);
+    EXPECT_TRUE(options.savesSerial);
+    EXPECT_EQ(optionsOf({"--save", "a", "--save-count", "1000"}).saveLimits.count, 1000u);
+}
+
 TEST(DaemonOptions, ADescriptionMayBeOfChosenDevices) {
     EXPECT_TRUE(optionsOf({"--wait"}).waits);
     EXPECT_TRUE(optionsOf({"--describe"}).describe);
@@ -178,7 +190,8 @@ TEST(DaemonOptions, HelpSaysWhatItIsAndNamesEveryOption) {
     EXPECT_THAT(help, HasSubstr("\nUsage: zorvatouchd [OPTIONS]\n"));
     for (const char *option :
          {"--device", "--seed", "--duration", "--id", "--wait", "--accel", "--map", "--no-keys", "--keys",
-          "--key-limit", "--events", "--save", "--log-level", "--describe", "--plugin", "--version"})
+          "--key-limit", "--events", "--save", "--save-count", "--save-bytes", "--save-serial", "--log-level",
+          "--describe", "--plugin", "--version"})
         EXPECT_THAT(help, HasSubstr(std::string("\n  ") + option + " ")) << option;
     for (const char *group : {"Surfaces", "Keys", "Output", "Other", "Examples", "Signals", "Exit status"})
         EXPECT_THAT(help, HasSubstr(std::string("\n") + group + ":\n")) << group;
@@ -266,6 +279,16 @@ TEST(DaemonOptions, UnknownKeysAreRefusedWithTheKnownOnes) {
               "--map: 'left' is no region; there are play-pause, volume-down, volume-up");
     EXPECT_EQ(problemWith({"--map", "tap"}),
               "--map: 'tap' is not GESTURE:REGION=KEY, which is written as tap:volume-up=KEY_NEXTSONG");
+}
+
+TEST(DaemonOptions, LimitsOfRecordingsMustFit) {
+    EXPECT_EQ(problemWith({"--save", "a", "--save-count", "1001"}),
+              "--save-count: '1001': must be an integer from 1 to 1000");
+    EXPECT_NE(problemWith({"--save", "a", "--save-count", "0"}), "none");
+    EXPECT_NE(problemWith({"--save", "a", "--save-count", "1.5"}), "none");
+    EXPECT_NE(problemWith({"--save", "a", "--save-bytes", "0"}), "none");
+    for (const char *option : {"--save-count=2", "--save-bytes=2", "--save-serial"})
+        EXPECT_EQ(problemWith({option}), "--save-count, --save-bytes and --save-serial need --save FILE");
 }
 
 TEST(DaemonOptions, OtherValuesAreRefused) {

@@ -9,11 +9,16 @@
 #include <unistd.h>
 
 #include <atomic>
+#include <chrono>
+#include <cstdint>
 #include <cstdio>
 #include <filesystem>
+#include <limits>
+#include <stop_token>
 #include <string>
 #include <thread>
 #include <utility>
+#include <vector>
 
 namespace ZorvaTouch::Tools {
 namespace {
@@ -21,6 +26,12 @@ namespace {
 constexpr const char *kTwoReports =
     R"({"Version":2,"Frames":[{"Type":"State","Timestamp":1,"Key":"Algs.ActivationThreshold","Value":200.0},)"
     R"({"Type":"InputReport","Timestamp":2,"Data":"01 ab "},{"Type":"InputReport","Timestamp":3,"Data":""}]})";
+
+constexpr std::uint64_t kWithoutEnd = std::numeric_limits<std::uint64_t>::max();
+
+std::size_t save(const std::string &file, std::string_view text, std::uint64_t mostBytes = kWithoutEnd) {
+    return saveRecordingFile(file, {.text = std::string(text), .history = {}, .notes = {}}, mostBytes);
+}
 
 class RecordingSaver : public ::testing::Test {
 protected:
@@ -36,7 +47,7 @@ protected:
     /// What is said about saving; the folder's name is "@".
     [[nodiscard]] std::string problemWith(const std::string &file, std::string_view text) const {
         try {
-            static_cast<void>(saveRecordingFile(file, text));
+            static_cast<void>(save(file, text));
             return {};
         } catch (const SavingError &error) {
             std::string message = error.what();
@@ -50,15 +61,15 @@ protected:
 };
 
 TEST_F(RecordingSaver, CountsTheReports) {
-    EXPECT_EQ(saveRecordingFile(path("a.json"), kTwoReports), 2u);
+    EXPECT_EQ(save(path("a.json"), kTwoReports), 2u);
     EXPECT_EQ(Host::readFile(path("a.json")), kTwoReports);
-    EXPECT_EQ(saveRecordingFile(path("a.json"), R"({"Version":2,"Frames":[]})"), 0u);
+    EXPECT_EQ(save(path("a.json"), R"({"Version":2,"Frames":[]})"), 0u);
 }
 
 TEST_F(RecordingSaver, NobodyElseReadsIt) {
     Host::replaceFile(path("a.json"), "older");
     ASSERT_EQ(::chmod(path("a.json").c_str(), 0644), 0);
-    EXPECT_EQ(saveRecordingFile(path("a.json"), kTwoReports), 2u);
+    EXPECT_EQ(save(path("a.json"), kTwoReports), 2u);
     struct stat status {};
     ASSERT_EQ(::stat(path("a.json").c_str(), &status), 0);
     EXPECT_EQ(status.st_mode & 07777, 0600u);
@@ -133,34 +144,81 @@ TEST_F(RecordingSaver, IsNotBlockedByAFifoThatIsExchangedForTheFile) {
     Host::replaceFile(path("a.json"), "older");
     Exchanger opponent(path("a.json"), path("pipe"));
     unsigned saved = 0;
-    for (int i = 0; i < 400; ++i)
+    for (int i = 0; i < 150; ++i)
         saved += problemWith(path("a.json"), kTwoReports).empty() ? 1 : 0;
     opponent.finish();
     EXPECT_EQ(opponent.caught(), 0u);
     EXPECT_GT(saved, 0u);
 }
 
-TEST_F(RecordingSaver, WhatCannotBeSavedIsToldAtTheStart) {
-    EXPECT_NO_THROW(requireSavable(path("a.json")));
+TEST_F(RecordingSaver, AFileThatIsLongerThanAllowedIsNotWritten) {
+    Host::replaceFile(path("a.json"), "older");
+    const std::size_t length = std::string_view(kTwoReports).size();
+    EXPECT_EQ(save(path("b.json"), kTwoReports, length), 2u);
     try {
-        requireSavable(path("no/a.json"));
+        save(path("a.json"), kTwoReports, length - 1);
         FAIL();
     } catch (const SavingError &error) {
-        EXPECT_EQ(error.what(),
-                  path("no/a.json") + ": cannot open a temporary file beside it: No such file or directory");
+        EXPECT_EQ(error.what(), path("a.json") + ": not written, since its 202 bytes are more than the 201 "
+                                                 "that --save-bytes allows");
     }
+    EXPECT_EQ(Host::readFile(path("a.json")), "older");
+}
+
+TEST_F(RecordingSaver, NothingIsWrittenAfterItWasGivenUp) {
+    std::stop_source givenUp;
+    givenUp.request_stop();
+    EXPECT_THROW(saveRecordingFile(path("a.json"), {.text = kTwoReports, .history = {}, .notes = {}},
+                                   kWithoutEnd, givenUp.get_token()),
+                 SavingError);
     EXPECT_TRUE(std::filesystem::is_empty(_folder));
 }
 
-TEST(RecordingNames, OfFurtherSurfacesAreNumbered) {
-    EXPECT_EQ(fileOfSurface("touch.json", 1), "touch.json");
-    EXPECT_EQ(fileOfSurface("touch.json", 2), "touch-2.json");
-    EXPECT_EQ(fileOfSurface("/a.b/touch.x.json", 10), "/a.b/touch.x-10.json");
-    EXPECT_EQ(fileOfSurface("/a.b/touch", 2), "/a.b/touch-2");
-    EXPECT_EQ(fileOfSurface("touch", 3), "touch-3");
-    EXPECT_EQ(fileOfSurface(".touch", 2), ".touch-2");
-    EXPECT_EQ(fileOfSurface("a/.touch", 2), "a/.touch-2");
-    EXPECT_EQ(fileOfSurface("touch.", 2), "touch-2.");
+/// What is said at the start about these names; the folder's name is "@".
+std::string problemAtTheStart(const std::string &folder, const std::vector<std::string> &files) {
+    try {
+        requireSavable(files);
+        return {};
+    } catch (const SavingError &error) {
+        std::string message = error.what();
+        return message.replace(message.find(folder), folder.size(), "@");
+    }
+}
+
+TEST_F(RecordingSaver, WhatCannotBeSavedIsToldAtTheStart) {
+    EXPECT_EQ(problemAtTheStart(_folder, {path("a.json"), path("a-2.json")}), "");
+    EXPECT_TRUE(std::filesystem::is_empty(_folder));
+    EXPECT_EQ(problemAtTheStart(_folder, {path("no/a.json")}),
+              "@/no/a.json: cannot open a temporary file beside it: No such file or directory");
+    std::filesystem::create_directory(path("a-2.json"));
+    EXPECT_EQ(problemAtTheStart(_folder, {path("a.json"), path("a-2.json")}),
+              "@/a-2.json: cannot replace: Is a directory");
+    const std::string longest(255, 'a');
+    EXPECT_EQ(problemAtTheStart(_folder, {path(longest), path(longest + "-2")}),
+              "@/" + longest + "-2: cannot replace: File name too long");
+}
+
+TEST_F(RecordingSaver, TheOldestGoUntilTheRestFits) {
+    using std::chrono::seconds;
+    const auto now = std::filesystem::file_time_type::clock::now();
+    const std::vector<std::string> files{path("a"), path("b"), path("c"), path("d"), path("e")};
+    for (std::size_t i = 0; i < 4; ++i) { // "e" does not exist; "b" is the oldest, then "c", "d", "a"
+        Host::replaceFile(files[i], std::string(100, 'x'));
+        std::filesystem::last_write_time(files[i], now - seconds(i == 0 ? 0 : 10 - i));
+    }
+    EXPECT_TRUE(removeOldestRecordings(files, path("a"), 400).empty());
+    EXPECT_EQ(removeOldestRecordings(files, path("b"), 399), std::vector{path("c")});
+    EXPECT_EQ(removeOldestRecordings(files, path("a"), 150), (std::vector{path("b"), path("d")}));
+    EXPECT_EQ(Host::readFile(path("a")).size(), 100u);
+}
+
+TEST_F(RecordingSaver, OnlyFilesAreRemoved) {
+    Host::replaceFile(path("precious"), std::string(100, 'x'));
+    ASSERT_EQ(::symlink("precious", path("a").c_str()), 0);
+    std::filesystem::create_directory(path("b"));
+    const std::vector<std::string> files{path("a"), path("b"), path("c")};
+    EXPECT_TRUE(removeOldestRecordings(files, path("c"), 0).empty());
+    EXPECT_EQ(Host::readFile(path("a")).size(), 100u);
 }
 
 } // namespace

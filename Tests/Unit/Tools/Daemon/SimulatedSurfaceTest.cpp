@@ -5,6 +5,10 @@
 
 #include <gmock/gmock.h>
 
+#include <atomic>
+#include <cstdint>
+#include <memory>
+#include <span>
 #include <string>
 #include <vector>
 
@@ -44,6 +48,23 @@ TEST_F(SimulatedSurfaceTest, SaysOnTheMainLoopWhenAllHasBeenPlayed) {
     surface.play();
     loop.run();
     EXPECT_EQ(finished, 1);
+}
+
+TEST_F(SimulatedSurfaceTest, ItsObserverIsNotifiedOfEachReport) {
+    struct Counter final : Linux::HidrawObserver {
+        void onGone(const Linux::SystemFailure &) noexcept override {}
+        void onFailure(const Linux::SystemFailure &) noexcept override {}
+        void onReport(std::uint64_t, std::span<const std::uint8_t> report) noexcept override {
+            reports += report.size() == 73 ? 1 : 0;
+        }
+        std::atomic<int> reports = 0;
+    };
+    const auto counter = std::make_shared<Counter>();
+    SimulatedSurface surface(finger("taps", 0.1), {}, loop, [this] { loop.quit(); });
+    static_cast<void>(surface.maker()(counter));
+    surface.play();
+    loop.run();
+    EXPECT_EQ(counter->reports, 9) << "at 10 to 90 ms";
 }
 
 TEST_F(SimulatedSurfaceTest, OneThatIsGoneSaysNothing) {

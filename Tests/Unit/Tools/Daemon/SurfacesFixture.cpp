@@ -114,8 +114,10 @@ SurfacesFixture::SurfacesFixture() {
         [this](const Linux::DeviceIdentity &device) { return makerOf(device); }, clock,
         SurfaceHooks{.onComing = [this](const SurfaceName &name) { came.push_back(name.id); },
                      .onEnding =
-                         [this](const SurfaceName &name, const Surface &) {
+                         [this](const SurfaceName &name, const Surface &surface) {
                              ended.push_back(name.id);
+                             if (whenEndingSurface)
+                                 whenEndingSurface(name, surface);
                              if (whenEnding)
                                  whenEnding();
                          }});

@@ -130,6 +130,7 @@ protected:
     std::function<std::shared_ptr<Linux::HidrawObserver>(std::shared_ptr<Linux::HidrawObserver>)> observedBy;
     Lines came, ended; ///< the surfaces that came, and those that worked and were closed
     std::function<void()> whenEnding;
+    std::function<void(const SurfaceName &, const Surface &)> whenEndingSurface;
     std::optional<Surfaces> surfaces;
 
 private:
