@@ -5,13 +5,16 @@
 #include <gtest/gtest.h>
 
 #include <fcntl.h>
+#include <sys/inotify.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <array>
 #include <atomic>
 #include <chrono>
 #include <cstdint>
 #include <cstdio>
+#include <cstring>
 #include <filesystem>
 #include <limits>
 #include <stop_token>
@@ -118,9 +121,17 @@ private:
     void exchange() {
         while (!_isOver) {
             ::renameat2(AT_FDCWD, _left.c_str(), AT_FDCWD, _right.c_str(), RENAME_EXCHANGE);
+            if (!isFifo(_left) && !isFifo(_right)) { // it was replaced
+                ::unlink(_right.c_str());
+                ::mkfifo(_right.c_str(), 0600);
+            }
             release(_left);
             release(_right);
         }
+    }
+    [[nodiscard]] static bool isFifo(const std::string &path) {
+        struct stat status {};
+        return ::lstat(path.c_str(), &status) == 0 && S_ISFIFO(status.st_mode);
     }
     /// Opens a FIFO for writing, which fails unless somebody waits in its opening for reading.
     void release(const std::string &path) {
@@ -149,6 +160,25 @@ TEST_F(RecordingSaver, IsNotBlockedByAFifoThatIsExchangedForTheFile) {
     opponent.finish();
     EXPECT_EQ(opponent.caught(), 0u);
     EXPECT_GT(saved, 0u);
+}
+
+TEST_F(RecordingSaver, NothingIsOpenedUnderTheNameOfTheFile) {
+    const int watch = ::inotify_init1(IN_CLOEXEC | IN_NONBLOCK);
+    ASSERT_GE(::inotify_add_watch(watch, _folder.c_str(), IN_OPEN | IN_MOVED_TO), 0);
+    EXPECT_EQ(save(path("a.json"), kTwoReports), 2u);
+    alignas(inotify_event) std::array<char, 4096> buffer{};
+    const ssize_t length = ::read(watch, buffer.data(), buffer.size());
+    ::close(watch);
+    std::string seen;
+    for (ssize_t at = 0; at < length;) {
+        inotify_event event{};
+        std::memcpy(&event, &buffer[static_cast<std::size_t>(at)], sizeof event);
+        const std::string name = event.len == 0 ? "" : &buffer[static_cast<std::size_t>(at) + sizeof event];
+        if (name == "a.json")
+            seen.append((event.mask & IN_OPEN) != 0 ? "opened " : "renamed ");
+        at += static_cast<ssize_t>(sizeof event + event.len);
+    }
+    EXPECT_EQ(seen, "renamed ");
 }
 
 TEST_F(RecordingSaver, AFileThatIsLongerThanAllowedIsNotWritten) {
