@@ -225,10 +225,12 @@ private:
                   "Write the recording at the end and at SIGUSR1, for its owner only\n"
                   "Further recordings go to FILE with -2, -3 before its ending");
         addOption(kGroup, "--save-count", _saveCount, "N",
-                  "Files of recordings, at most; the oldest goes first (default: 16)");
+                  "Keep at most so many recordings; the oldest are\n"
+                  "replaced first (default: 16)");
         addOption(kGroup, "--save-bytes", _saveBytes, "N",
-                  "Bytes of all of them, at most (default: 67108864, 64 MiB)");
-        addFlag(kGroup, "--save-serial", _savesSerial, "Note the surface's serial number in recordings");
+                  "Keep at most so many bytes of recordings; the\n"
+                  "oldest are removed first (default: 67108864)");
+        addFlag(kGroup, "--save-serial", _savesSerial, "Write serial numbers into recordings");
         addOption(kGroup, "--log-level", _logLevel, "LEVEL",
                   "Log from this level on: error, default (unless given), debug");
         addFlag(kGroup, "--describe", _describe, "Say as JSON what is there, and exit");
