@@ -23,11 +23,22 @@ public:
         if (depth >= ZORVA_VALUE_MAX_LEVELS)
             throw std::length_error("a value has more than 64 levels");
         if (_parts == ZORVA_VALUE_MAX_PARTS)
-            throw std::length_error("a value has more than 1000000 parts");
+            throwTooMany();
         ++_parts;
     }
 
+    /// Refuses a count of parts before any of them is read: what is claimed may be endless.
+    /// @throws std::length_error  So many more are beyond the limit.
+    void requireRoom(std::size_t count) const {
+        if (count > ZORVA_VALUE_MAX_PARTS - _parts)
+            throwTooMany();
+    }
+
 private:
+    [[noreturn]] static void throwTooMany() {
+        throw std::length_error("a value has more than 1000000 parts");
+    }
+
     std::size_t _parts = 0;
 };
 
@@ -163,6 +174,7 @@ private:
     PropertyValue readArray(const ZorvaValue *value, std::size_t depth) {
         PropertyValue::Array array;
         const std::size_t count = value->table->count(value);
+        _parts.requireRoom(count);
         for (std::size_t index = 0; index < count; ++index)
             array.push_back(readPart(value->table->element(value, index), depth + 1));
         return array;
@@ -171,6 +183,7 @@ private:
     PropertyValue readDictionary(const ZorvaValue *value, std::size_t depth) {
         PropertyValue::Dictionary dictionary;
         const std::size_t count = value->table->count(value);
+        _parts.requireRoom(count);
         for (std::size_t index = 0; index < count; ++index) {
             std::size_t length = 0;
             const char *const key = value->table->key(value, index, &length);

@@ -32,6 +32,7 @@ struct ForeignValue : ZorvaValue {
     std::vector<const char *> keys;           ///< null beyond
     const ZorvaValue *everyElement = nullptr; ///< of all beyond
     const char *everyKey = nullptr;
+    mutable std::size_t partsAsked = 0; ///< calls of `element` and `key`
 
     static const ForeignValue &of(const ZorvaValue *value) {
         return static_cast<const ForeignValue &>(*value);
@@ -61,11 +62,13 @@ const ZorvaValueTable ForeignValue::kTable{
     .element =
         [](const ZorvaValue *value, std::size_t index) {
             const ForeignValue &self = of(value);
+            ++self.partsAsked;
             return index < self.elements.size() ? self.elements[index] : self.everyElement;
         },
     .key =
         [](const ZorvaValue *value, std::size_t index, std::size_t *size) {
             const ForeignValue &self = of(value);
+            ++self.partsAsked;
             const char *const key = index < self.keys.size() ? self.keys[index] : self.everyKey;
             *size = key ? 1 : 0;
             return key;
@@ -230,11 +233,21 @@ TEST(EndlessValue, OfMissingElementsIsRefusedToo) {
     EXPECT_EQ(refusalOf(uniform(kZorvaValueDictionary, nullptr, nullptr)), kTooLarge);
 }
 
+TEST(EndlessValue, IsRefusedBeforeAnyPartIsRead) {
+    for (const std::uint32_t kind : {kZorvaValueArray, kZorvaValueDictionary}) {
+        const ForeignValue value = uniform(kind, "k", nullptr, 1'000'000);
+        EXPECT_EQ(refusalOf(value), kTooLarge);
+        EXPECT_EQ(value.partsAsked, 0u);
+    }
+}
+
 TEST(EndlessValue, ThatContainsItselfIsRefused) {
     ForeignValue self(kZorvaValueArray);
-    self.count = SIZE_MAX;
     self.everyElement = &self;
+    self.count = 2;
     EXPECT_EQ(refusalOf(self), kTooDeep);
+    self.count = SIZE_MAX;
+    EXPECT_EQ(refusalOf(self), kTooLarge);
 }
 
 } // namespace
