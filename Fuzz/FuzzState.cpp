@@ -10,7 +10,7 @@
 // Shared/StateDescription.cpp Shared/SVM.cpp Shared/Util/PropertyValue.cpp Shared/Util/StateKey.cpp
 // Shared/VirtualImage.cpp
 //
-// Length: 256
+// Length: 160
 //
 // State writes of every kind of value to every key, mixed with images and other reports: nothing crashes, the
 // recording replays to the same events and state, a bounded recording keeps its tunables, and what is written

@@ -1,6 +1,5 @@
 #include "Fuzz/Transcript.h"
 #include "Plugin/ValueObject.h"
-#include "Shared/Util/Json.h"
 
 #include <cstddef>
 #include <cstdint>
@@ -80,10 +79,12 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t *data, std::size_t size
     ChaosValue chaos;
     chaos.table = &kChaosTable;
     chaos.answers = &answers;
+    PropertyValue read;
     try {
-        const PropertyValue read = readValue(&chaos);
-        ZORVA_MUST(Util::jsonText(readValue(makeValue(read).get())) == Util::jsonText(read));
-    } catch (const std::length_error &) { // beyond the limits of a value: refused as a whole
+        read = readValue(&chaos);
+    } catch (const std::length_error &) {
+        return 0; // beyond the limits of a value: refused as a whole
     }
+    ZORVA_MUST(readValue(makeValue(read).get()) == read);
     return 0;
 }

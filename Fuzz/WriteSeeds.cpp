@@ -118,7 +118,7 @@ void addGoldenCase(const Corpus &corpus, const fs::path &path) {
     const FrameList frames = Tools::parseStimulus(text).frames;
     addPieces(corpus, "container", name, frames, 6, writeRecordingContainer);
     addPieces(corpus, "reports", name, frames, 12, splitReports);
-    addPieces(corpus, "state", name, frames, 24, Fuzzing::shortRecording);
+    addPieces(corpus, "state", name, frames, 16, Fuzzing::shortRecording);
     corpus.add("hex", name, std::string_view(writeRecordingContainer(frames)).substr(0, 200));
 }
 
