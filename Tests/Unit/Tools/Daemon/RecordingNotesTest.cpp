@@ -28,7 +28,7 @@ protected:
     }
 
     const Ref<Simulated::Device> device = Simulated::Device::create();
-    HostedService service{ZORVA_TEST_PLUGIN};
+    HostedService service{openPlugIn(ZORVA_TEST_PLUGIN)};
 };
 
 TEST(Fnv1a64, IsAsPublished) {
