@@ -226,7 +226,7 @@ TEST_F(RecordingKeeperTest, AMinuteIsKeptAlsoWithAnAccelerometer) {
     std::size_t reports = 0, samples = 0;
     std::uint32_t firstNumber = 0, lastNumber = 0;
     for (const FrameView &frame : frames) {
-        samples += frame.key == "Accel" ? 1 : 0;
+        samples += frame.key == "Accel" ? 1u : 0u;
         if (frame.type != FrameType::InputReport)
             continue;
         ++reports;

@@ -156,7 +156,7 @@ TEST_F(RecordingSaver, IsNotBlockedByAFifoThatIsExchangedForTheFile) {
     Exchanger opponent(path("a.json"), path("pipe"));
     unsigned saved = 0;
     for (int i = 0; i < 150; ++i)
-        saved += problemWith(path("a.json"), kTwoReports).empty() ? 1 : 0;
+        saved += problemWith(path("a.json"), kTwoReports).empty() ? 1u : 0u;
     opponent.finish();
     EXPECT_EQ(opponent.caught(), 0u);
     EXPECT_GT(saved, 0u);
