@@ -1,11 +1,11 @@
 #include "Host/Runtime/SpdlogLogs.h"
 
-#include <spdlog/logger.h>
-#include <spdlog/pattern_formatter.h>
-#include <spdlog/sinks/base_sink.h>
-#include <spdlog/sinks/stdout_sinks.h>
+#include "Host/Runtime/AsyncLogs.h"
+#include "Shared/Util/Text.h"
 
-#include <mutex>
+#include <spdlog/details/log_msg.h>
+#include <spdlog/pattern_formatter.h>
+
 #include <string>
 #include <utility>
 
@@ -24,49 +24,22 @@ std::string_view nameOf(Ports::LogLevel level) {
     return "error";
 }
 
-std::string fieldsText(std::string_view subsystem, std::string_view category) {
-    std::string text("subsystem=");
-    text.append(subsystem).append(" category=").append(category);
-    return text;
+} // namespace
+
+std::string logLine(const LogRecord &record) {
+    std::string fields(nameOf(record.level));
+    fields.append(" subsystem=").append(record.subsystem).append(" category=").append(record.category);
+    fields.append(" ").append(record.text);
+    spdlog::memory_buf_t line;
+    spdlog::pattern_formatter("%Y-%m-%dT%H:%M:%S.%e%z %v")
+        .format(spdlog::details::log_msg(record.time, {}, {}, spdlog::level::info, fields), line);
+    return {line.data(), line.size()};
 }
-
-} // namespace
-
-namespace {
-
-/// Hands records to a function.
-class WriterSink final : public spdlog::sinks::base_sink<std::mutex> {
-public:
-    explicit WriterSink(SpdlogLogs::Writer writer) : _writer(std::move(writer)) {}
-
-private:
-    void sink_it_(const spdlog::details::log_msg &message) override {
-        spdlog::memory_buf_t text;
-        formatter_->format(message, text);
-        _writer(std::string(text.data(), text.size()));
-    }
-    void flush_() override {}
-
-    const SpdlogLogs::Writer _writer;
-};
-
-} // namespace
-
-class SpdlogLogs::Sink {
-public:
-    explicit Sink(spdlog::sink_ptr sink) : logger("", std::move(sink)) {
-        // Levels are told apart before a record gets here and are part of its text.
-        logger.set_level(spdlog::level::trace);
-        logger.set_pattern("%Y-%m-%dT%H:%M:%S.%e%z %v");
-    }
-
-    spdlog::logger logger;
-};
 
 class SpdlogLogs::Handle final : public Ports::Log {
 public:
-    Handle(std::shared_ptr<Sink> sink, Ports::LogLevel minimum, std::string fields)
-        : _sink(std::move(sink)), _minimum(minimum), _fields(std::move(fields)) {}
+    Handle(std::FILE *stream, Ports::LogLevel minimum, std::string_view subsystem, std::string_view category)
+        : _stream(stream), _minimum(minimum), _subsystem(subsystem), _category(category) {}
 
     bool isEnabled(Ports::LogLevel level) const noexcept override { return level >= _minimum; }
 
@@ -74,27 +47,28 @@ public:
         if (!isEnabled(level))
             return;
         try {
-            _sink->logger.info("{} {} {}", nameOf(level), _fields, text);
-        } catch (...) { // no memory for the line: there is nobody to tell
+            const std::string shown = Util::printable(Util::withoutLineBreaksAtTheEnd(text));
+            const std::string line = logLine({.time = std::chrono::system_clock::now(),
+                                              .level = level,
+                                              .subsystem = _subsystem,
+                                              .category = _category,
+                                              .text = shown});
+            static_cast<void>(std::fwrite(line.data(), 1, line.size(), _stream)); // in one piece
+            static_cast<void>(std::fflush(_stream));
+        } catch (...) { // no memory for the line
         }
     }
 
 private:
-    const std::shared_ptr<Sink> _sink;
+    std::FILE *const _stream;
     const Ports::LogLevel _minimum;
-    const std::string _fields;
+    const std::string _subsystem, _category;
 };
 
-SpdlogLogs::SpdlogLogs(Ports::LogLevel minimum, std::FILE *stream)
-    : _minimum(minimum),
-      _sink(std::make_shared<Sink>(
-          std::make_shared<spdlog::sinks::stdout_sink_base<spdlog::details::console_mutex>>(stream))) {}
-
-SpdlogLogs::SpdlogLogs(Ports::LogLevel minimum, Writer writer)
-    : _minimum(minimum), _sink(std::make_shared<Sink>(std::make_shared<WriterSink>(std::move(writer)))) {}
+SpdlogLogs::SpdlogLogs(Ports::LogLevel minimum, std::FILE *stream) : _minimum(minimum), _stream(stream) {}
 
 std::shared_ptr<Ports::Log> SpdlogLogs::openLog(std::string_view subsystem, std::string_view category) {
-    return std::make_shared<Handle>(_sink, _minimum, fieldsText(subsystem, category));
+    return std::make_shared<Handle>(_stream, _minimum, subsystem, category);
 }
 
 } // namespace ZorvaTouch::Host

@@ -124,7 +124,8 @@ int StreamWriter::write(std::string_view text) noexcept {
 
 void StreamWriter::giveUp() noexcept {
     const std::uint64_t one = 1;
-    static_cast<void>(::write(_descriptors->wake, &one, sizeof one)); // full: it is readable already
+    // Full: it is readable already.
+    [[maybe_unused]] const ssize_t size = ::write(_descriptors->wake, &one, sizeof one);
 }
 
 } // namespace ZorvaTouch::Host

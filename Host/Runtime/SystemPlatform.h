@@ -2,10 +2,10 @@
 
 #include "Host/Interface/Platform.h"
 #include "Host/Runtime/ProbeTraceSink.h"
-#include "Host/Runtime/SpdlogLogs.h"
 #include "Host/Runtime/SteadyClock.h"
 
 #include <cstdio>
+#include <memory>
 
 namespace ZorvaTouch::Host {
 
@@ -15,12 +15,18 @@ inline constexpr const char *kLogLevelVariable = "ZORVATOUCH_LOG";
 /// The platform of a real machine.
 class SystemPlatform final : public Platform {
 public:
+    /// Logs to standard error by way of a thread (`AsyncLogs`), which starts when the first handle is opened.
     /// @param logLevel  The variable's value; null or empty is `error`, and so is what is none of the three,
     ///                  after a line in the log.
-    /// @param stream    Where the log goes. Borrowed; outlives the platform and the log's handles.
-    explicit SystemPlatform(const char *logLevel, std::FILE *stream = stderr);
+    explicit SystemPlatform(const char *logLevel);
+    /// Logs to a stream, and waits for it.
+    /// @param stream  Borrowed; outlives the platform and the log's handles.
+    SystemPlatform(const char *logLevel, std::FILE *stream);
+    ~SystemPlatform() override;
+    SystemPlatform(const SystemPlatform &) = delete;
+    SystemPlatform &operator=(const SystemPlatform &) = delete;
 
-    [[nodiscard]] Ports::LogProvider &logs() noexcept override { return _logs; }
+    [[nodiscard]] Ports::LogProvider &logs() noexcept override { return *_logs; }
     [[nodiscard]] Ports::Clock &clock() noexcept override { return _clock; }
     [[nodiscard]] TraceSink &trace() noexcept override { return _trace; }
     [[nodiscard]] std::unique_ptr<Semaphore> createSemaphore() override;
@@ -29,7 +35,9 @@ public:
     [[nodiscard]] int setRoundRobinPriority(int priority) noexcept override;
 
 private:
-    SpdlogLogs _logs;
+    SystemPlatform(const char *logLevel, std::unique_ptr<Ports::LogProvider> logs);
+
+    const std::unique_ptr<Ports::LogProvider> _logs;
     SteadyClock _clock;
     ProbeTraceSink _trace;
 };

@@ -55,6 +55,31 @@ Utf8Sequence nextSequence(std::string_view text) {
     return {lead.length, true};
 }
 
+constexpr std::string_view kHexDigits = "0123456789abcdef";
+
+void appendHexByte(std::string &text, unsigned char byte) {
+    text.push_back(kHexDigits[byte / 16U]);
+    text.push_back(kHexDigits[byte % 16U]);
+}
+
+constexpr bool isControl(unsigned char byte) { return byte < 0x20 || byte == 0x7F; }
+
+void appendControl(std::string &text, unsigned char byte) {
+    switch (byte) {
+    case '\n':
+        text.append("\\n");
+        return;
+    case '\r':
+        text.append("\\r");
+        return;
+    case '\t':
+        text.append("\\t");
+        return;
+    default:
+        appendHexByte(text.append("\\x"), byte);
+    }
+}
+
 } // namespace
 
 void appendInteger(std::string &text, std::int64_t value, std::size_t width) {
@@ -102,6 +127,29 @@ std::string repairUtf8(std::string_view text) {
         text.remove_prefix(sequence.length);
     }
     return repaired;
+}
+
+std::string printable(std::string_view text) {
+    std::string result;
+    result.reserve(text.size());
+    while (!text.empty()) {
+        const Utf8Sequence sequence = nextSequence(text);
+        const auto lead = static_cast<unsigned char>(text.front());
+        if (!sequence.valid)
+            result.append("\xEF\xBF\xBD");
+        else if (isControl(lead))
+            appendControl(result, lead);
+        else if (lead == 0xC2 && static_cast<unsigned char>(text[1]) < 0xA0)
+            appendHexByte(result.append("\\u00"), static_cast<unsigned char>(text[1]));
+        else
+            result.append(text.substr(0, sequence.length));
+        text.remove_prefix(sequence.length);
+    }
+    return result;
+}
+
+std::string_view withoutLineBreaksAtTheEnd(std::string_view text) noexcept {
+    return text.substr(0, text.find_last_not_of("\r\n") + 1); // npos + 1 is 0
 }
 
 bool isValidUtf8(std::string_view text) noexcept {

@@ -26,6 +26,15 @@ void appendShortest(std::string &text, double value);
 /// Returns `text` with every malformed UTF-8 sequence replaced by U+FFFD.
 [[nodiscard]] std::string repairUtf8(std::string_view text);
 
+/// Returns text from outside (a name, a user's word, a log record) as one line that does nothing to a
+/// terminal: line feed, carriage return and tab become `\n`, `\r`, `\t`; other control characters below
+/// U+0020 and U+007F become `\x1b`; those from U+0080 to U+009F become `\u009b`; malformed UTF-8 becomes
+/// U+FFFD. All else, backslashes too, stays as it is.
+[[nodiscard]] std::string printable(std::string_view text);
+
+/// Returns `text` without the line feeds and carriage returns at its end.
+[[nodiscard]] std::string_view withoutLineBreaksAtTheEnd(std::string_view text) noexcept;
+
 /// Whether `text` is well-formed UTF-8: no overlong forms, no surrogates, nothing above U+10FFFF.
 [[nodiscard]] bool isValidUtf8(std::string_view text) noexcept;
 

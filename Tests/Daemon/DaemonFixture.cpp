@@ -76,7 +76,7 @@ void DaemonFixture::start() {
             };
     };
     daemon.emplace(options, DaemonSurroundings{.plugIn = plugIn,
-                                               .logs = logs,
+                                               .logs = *logProvider,
                                                .clock = clock,
                                                .output = output,
                                                .usesColour = false,

@@ -73,6 +73,7 @@ protected:
     DaemonOptions options;
     std::string plugIn = ZORVA_TEST_PLUGIN;
     JournalOfLogs logs;
+    Ports::LogProvider *logProvider = &logs; ///< where the daemon logs
     Host::SteadyClock clock;
     FakeKeyboards keys;
     bool hasKeyboard = true;

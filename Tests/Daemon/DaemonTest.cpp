@@ -1,14 +1,19 @@
 #include "Tests/Daemon/DaemonFixture.h"
 
+#include "Host/Linux/Journal.h"
+#include "Host/Runtime/AsyncLogs.h"
 #include "Host/Runtime/Files.h"
 #include "Service/AccelCapture.h"
 #include "Shared/RecordingContainer.h"
+#include "Tests/Unit/Host/Linux/JournalSocket.h"
 
 #include <gmock/gmock.h>
 
 #include <cerrno>
 #include <csignal>
+#include <cstddef>
 #include <filesystem>
+#include <memory>
 #include <stdexcept>
 #include <string>
 
@@ -225,6 +230,24 @@ TEST_F(DaemonTest, AnOutputThatNobodyReadsKeepsNeitherKeysNorTheEndWaiting) {
     runToTheEnd();
     EXPECT_THAT(keys.journal.lines(), ElementsAre("1 plugged", "1 +115", "1 -115", "1 unplugged"));
     EXPECT_EQ(logs.lines().count("Events error: standard output: its reader hangs"), 1u);
+}
+
+TEST_F(DaemonTest, AJournalThatDoesNotReadKeepsNeitherKeysNorTheEndWaiting) {
+    const Linux::Tests::JournalSocket journal;
+    Host::AsyncLogs stalled(Ports::LogLevel::Debug, Linux::journalFormat(),
+                            std::make_shared<Linux::JournalWriter>(journal.path()));
+    for (std::size_t i = 0; i < 2 * Host::AsyncWriter::kCapacity; ++i)
+        stalled.openLog("s", "c")->write(Ports::LogLevel::Error, "full");
+    journal.waitUntilFull();
+    logProvider = &stalled;
+    options.logLevel = Ports::LogLevel::Debug; // each report is a record on the input thread
+    addFinger("holds", std::nullopt);
+    keys.onPress = [](KeyCode) { signal(SIGTERM); };
+    start();
+    daemon->run();
+    finish();
+    EXPECT_THAT(keys.journal.lines(), SizeIs(4));
+    EXPECT_THAT(keys.down(), IsEmpty());
 }
 
 TEST_F(DaemonTest, AnOutputThatFailsIsOneLineAndItGoesOn) {

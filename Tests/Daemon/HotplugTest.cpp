@@ -37,6 +37,9 @@ protected:
         std::string hid, node;
     };
 
+    /// As the program does, before the first thread: the mock library has threads before the daemon exists.
+    static void SetUpTestSuite() { Host::blockForGood(Daemon::kSignals); }
+
     void SetUp() override {
         ASSERT_TRUE(::umockdev_in_mock_environment()) << "run by umockdev-wrapper";
         for (const char *const node : {"/dev/hidraw1", "/dev/hidraw2", "/dev/hidraw3"})

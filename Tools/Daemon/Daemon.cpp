@@ -11,6 +11,7 @@
 #include "Tools/Daemon/PlugInLogs.h"
 #include "Tools/Daemon/RecordingSaver.h"
 
+#include <cerrno>
 #include <csignal>
 #include <cstring>
 #include <new>
@@ -33,6 +34,14 @@ std::string droppedLine(bool isJson, std::uint64_t lines) {
     return isJson ? lineOf(DroppedNews{.lines = lines}) : droppedKeyLine(lines);
 }
 
+void logOutputFailure(const DaemonLog &log, int errorNumber, std::size_t lost) noexcept {
+    if (errorNumber == ECANCELED)
+        log.error({"standard output: its reader hangs; lines that it does not get: ", std::to_string(lost)});
+    else
+        log.error({"standard output: cannot write: ", std::generic_category().message(errorNumber),
+                   "; nothing is shown any more"});
+}
+
 } // namespace
 
 // --- Putting together --------------------------------------------------------------------------------------
@@ -42,9 +51,11 @@ Daemon::Daemon(const DaemonOptions &options, DaemonSurroundings surroundings)
       _platform(std::make_unique<PlugInLogs>(_logs), &_surroundings.clock), _log(*_logs, "Daemon"),
       _plugIn(loadPlugIn()),
       _stream(
-          _surroundings.output,
+          "zorva-print", _surroundings.output,
           [isJson = options.showsEvents](std::uint64_t lines) { return droppedLine(isJson, lines); },
-          _logs->openLog(kLogSubsystem, "Events")),
+          [log = DaemonLog(*_logs, "Events")](int errorNumber, std::size_t lost) {
+              logOutputFailure(log, errorNumber, lost);
+          }),
       _listener(makeListener()), _keyQueue("zorva-keys", realTimePriority()),
       _keyboard(pressesKeys(options) ? _surroundings.keyboard : nullptr, *_listener,
                 DaemonLog(*_logs, "Keys")),

@@ -7,6 +7,7 @@
 #include "Host/Linux/RateLimitedLogs.h"
 #include "Host/Linux/SleepWatch.h"
 #include "Host/Objects/EventSystem.h"
+#include "Host/Runtime/AsyncWriter.h"
 #include "Host/Runtime/SerialQueue.h"
 #include "Host/Runtime/SignalWatch.h"
 #include "Host/Runtime/StreamWriter.h"
@@ -107,7 +108,7 @@ private:
     const DaemonLog _log;
     const std::shared_ptr<const Host::PlugInFile>
         _plugIn; ///< the same for every surface, as long as it lives
-    EventStream _stream;
+    Host::AsyncWriter _stream;
     const std::unique_ptr<DaemonListener> _listener;
     Host::SerialQueue _keyQueue;
     Keyboard _keyboard;

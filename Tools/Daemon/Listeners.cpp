@@ -141,7 +141,8 @@ void JsonListener::onRecording(const SurfaceName &surface, const std::string &fi
 
 // --- People ------------------------------------------------------------------------------------------------
 
-ScreenListener::ScreenListener(EventStream &stream, Ports::Clock &clock, bool usesColour, bool showsSurface)
+ScreenListener::ScreenListener(Host::AsyncWriter &stream, Ports::Clock &clock, bool usesColour,
+                               bool showsSurface)
     : _stream(stream), _clock(clock), _ticks(clock), _beganTicks(clock.nowTicks()), _usesColour(usesColour),
       _showsSurface(showsSurface) {}
 

@@ -1,9 +1,9 @@
 #pragma once
 
+#include "Host/Runtime/AsyncWriter.h"
 #include "Shared/Util/Ticks.h"
 #include "Tools/Daemon/DaemonListener.h"
 #include "Tools/Daemon/DaemonLog.h"
-#include "Tools/Daemon/EventStream.h"
 
 #include <cstdint>
 #include <memory>
@@ -53,7 +53,8 @@ private:
 class JsonListener final : public DaemonListener {
 public:
     /// @param stream, clock  Borrowed.
-    JsonListener(EventStream &stream, Ports::Clock &clock) : _stream(stream), _clock(clock), _ticks(clock) {}
+    JsonListener(Host::AsyncWriter &stream, Ports::Clock &clock)
+        : _stream(stream), _clock(clock), _ticks(clock) {}
 
     void onSurface(const SurfaceName &surface, SurfaceState state, std::string_view reason) noexcept override;
     void onEvent(const SurfaceName &surface, const HostEvent &event) noexcept override;
@@ -69,7 +70,7 @@ private:
     template <typename News> void put(const News &news) noexcept;
     [[nodiscard]] std::uint64_t nowNs() noexcept;
 
-    EventStream &_stream;
+    Host::AsyncWriter &_stream;
     Ports::Clock &_clock;
     const Util::TickConverter _ticks;
 };
@@ -79,13 +80,13 @@ class ScreenListener final : public DaemonListener {
 public:
     /// @param stream, clock      Borrowed. Times are shown from now on.
     /// @param showsSurface  Whether a line says which surface it is about.
-    ScreenListener(EventStream &stream, Ports::Clock &clock, bool usesColour, bool showsSurface);
+    ScreenListener(Host::AsyncWriter &stream, Ports::Clock &clock, bool usesColour, bool showsSurface);
 
     void onKey(const SurfaceName &surface, const HostEvent *cause, KeyChange change,
                bool isSent) noexcept override;
 
 private:
-    EventStream &_stream;
+    Host::AsyncWriter &_stream;
     Ports::Clock &_clock;
     const Util::TickConverter _ticks;
     const std::uint64_t _beganTicks;

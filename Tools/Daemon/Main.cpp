@@ -1,8 +1,9 @@
 #include "Host/Linux/HidrawFile.h"
 #include "Host/Linux/HidrawOpeners.h"
-#include "Host/Linux/JournalLogs.h"
+#include "Host/Linux/Journal.h"
 #include "Host/Linux/StandardStreams.h"
 #include "Host/Linux/VirtualKeyboard.h"
+#include "Host/Runtime/AsyncLogs.h"
 #include "Host/Runtime/Signals.h"
 #include "Host/Runtime/SpdlogLogs.h"
 #include "Host/Runtime/SteadyClock.h"
@@ -13,7 +14,6 @@
 #include "Tools/Daemon/Describe.h"
 #include "Tools/Hosting/ProgramFolder.h"
 
-#include <cstdint>
 #include <cstdlib>
 #include <exception>
 #include <memory>
@@ -29,32 +29,12 @@ using namespace ZorvaTouch;
 
 enum ExitStatus { kExitEnded = 0, kExitFailed = 1, kExitWrongUsage = 2, kExitInUse = 3 };
 
-/// The log as text on standard error, by way of a thread of its own: whoever reads it, a terminal that is
-/// stopped say, keeps no key waiting.
-class TextLogs final : public Ports::LogProvider {
-public:
-    explicit TextLogs(Ports::LogLevel level)
-        : _stream(
-              std::make_shared<Host::StreamWriter>(Host::StandardStream::Error),
-              [](std::uint64_t lines) {
-                  return std::to_string(lines) + " lines of the log are missing here\n";
-              },
-              Ports::silentLogProvider().openLog({}, {})),
-          _logs(level, [this](std::string record) { _stream.put(std::move(record)); }) {}
-
-    std::shared_ptr<Ports::Log> openLog(std::string_view subsystem, std::string_view category) override {
-        return _logs.openLog(subsystem, category);
-    }
-
-private:
-    Tools::EventStream _stream;
-    Host::SpdlogLogs _logs; ///< whose handles are gone by the end
-};
-
 std::unique_ptr<Ports::LogProvider> openLogs(Ports::LogLevel level) {
-    if (Linux::JournalLogs::isJournalStream(static_cast<int>(Host::StandardStream::Error)))
-        return std::make_unique<Linux::JournalLogs>(level);
-    return std::make_unique<TextLogs>(level);
+    if (Linux::isJournalStream(static_cast<int>(Host::StandardStream::Error)))
+        return std::make_unique<Host::AsyncLogs>(level, Linux::journalFormat(),
+                                                 std::make_shared<Linux::JournalWriter>());
+    return std::make_unique<Host::AsyncLogs>(
+        level, Host::logLine, std::make_shared<Host::StreamWriter>(Host::StandardStream::Error));
 }
 
 Linux::HidrawOpener openerOf(const Linux::DeviceIdentity &device) {

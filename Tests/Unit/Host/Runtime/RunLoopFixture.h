@@ -11,6 +11,13 @@ namespace ZorvaTouch::Host::RuntimeTests {
 /// A run loop of the system's platform, and sources that write down who was served.
 class RunLoopFixture : public ::testing::Test {
 protected:
+    RunLoopFixture() {
+        setProcessPlatform(&platform); // whose log the loop gets
+        loop = platform.createRunLoop();
+        boundary = loop->boundary();
+    }
+    ~RunLoopFixture() override { setProcessPlatform(nullptr); }
+
     /// A signalled source; `action` is what it does beside leaving its name in `served`.
     std::uint64_t addSource(char name, std::function<void()> action = {}, const char *mode = "mode") {
         return boundary->table->addSource(boundary, mode, &Callable::call, callable(name, action));
@@ -33,8 +40,8 @@ protected:
     LogText log;
     SystemPlatform platform{"debug", log.file()};
     std::string served;
-    std::shared_ptr<RunLoop> loop = platform.createRunLoop();
-    ZorvaRunLoop *boundary = loop->boundary();
+    std::shared_ptr<RunLoop> loop;
+    ZorvaRunLoop *boundary = nullptr;
 
 private:
     void *callable(char name, const std::function<void()> &action) {

@@ -49,7 +49,7 @@ TEST(SystemPlatform, SaysInOneLineThatItDoesNotKnowALevel) {
     const LogText log;
     EXPECT_EQ(enabledLevels("Debug\n\x1b[31m", log), "e");
     EXPECT_EQ(log.text(), "error subsystem=org.zorva.hid.ZorvaTouch category=Platform "
-                          "ZORVATOUCH_LOG is debug, default or error, not Debug??[31m\n");
+                          "ZORVATOUCH_LOG must be debug, default or error, not Debug\\n\\x1b[31m\n");
 }
 
 // --- Clock and trace points ------------------------------------------------------------------------

@@ -189,5 +189,26 @@ TEST(Text, MalformedUtf8IsReplaced) {
 
 #undef REPLACED
 
+TEST(Text, PrintableEscapesAllThatControlsATerminal) {
+    EXPECT_EQ(Util::printable("plain \\ text"), "plain \\ text");
+    EXPECT_EQ(Util::printable("a\nb\rc\td"), "a\\nb\\rc\\td");
+    EXPECT_EQ(Util::printable(std::string_view("\0\x07\x1b[2J\x1f\x7f", 8)), "\\x00\\x07\\x1b[2J\\x1f\\x7f");
+    EXPECT_EQ(Util::printable("\xC2\x80\xC2\x9B\xC2\x9F"), "\\u0080\\u009b\\u009f");
+    EXPECT_EQ(Util::printable("\xC2\xA0\xC3\xA9\xE2\x82\xAC"),
+              "\xC2\xA0\xC3\xA9\xE2\x82\xAC"); // U+00A0 and on stay
+    EXPECT_EQ(Util::printable("\x9B"
+                              "31m"),
+              "\xEF\xBF\xBD"
+              "31m"); // a single byte
+    EXPECT_EQ(Util::printable("\xC2"), "\xEF\xBF\xBD");
+}
+
+TEST(Text, LineBreaksAtTheEndAreLeftOut) {
+    EXPECT_EQ(Util::withoutLineBreaksAtTheEnd("one\ntwo\r\n\n"), "one\ntwo");
+    EXPECT_EQ(Util::withoutLineBreaksAtTheEnd(" kept "), " kept ");
+    EXPECT_EQ(Util::withoutLineBreaksAtTheEnd("\r\n"), "");
+    EXPECT_EQ(Util::withoutLineBreaksAtTheEnd(""), "");
+}
+
 } // namespace
 } // namespace ZorvaTouch

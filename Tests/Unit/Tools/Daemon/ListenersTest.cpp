@@ -42,7 +42,7 @@ protected:
     Tests::JournalOfLogs logs;
     Simulated::VirtualClock clock{1000, {125, 3}}; // 41666 ns
     const std::shared_ptr<Text> output = std::make_shared<Text>();
-    EventStream stream{output, [](std::uint64_t) { return std::string(); }, logs.openLog("", "Events")};
+    Host::AsyncWriter stream{"zorva-print", output, [](std::uint64_t) { return std::string(); }, {}};
 };
 
 TEST_F(ListenersTest, ProgramsHearOfEverythingAsLinesOfJson) {

@@ -1,6 +1,4 @@
-#include "Tools/Daemon/EventStream.h"
-
-#include "Shared/Ports/Log.h"
+#include "Host/Runtime/AsyncWriter.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -12,16 +10,17 @@
 #include <mutex>
 #include <string>
 #include <thread>
+#include <utility>
 #include <vector>
 
-namespace ZorvaTouch::Tools {
+namespace ZorvaTouch::Host {
 namespace {
 
 using std::chrono::milliseconds;
 using testing::ElementsAre;
 
 /// A reader that takes as many writes as it is told to, and tells how many were begun.
-class Reader final : public Host::TextWriter {
+class Reader final : public TextWriter {
 public:
     ~Reader() override { _isGone.set_value(); }
 
@@ -75,36 +74,36 @@ private:
     std::string _text;
 };
 
-class NotedLog final : public Ports::Log {
+/// The failures that were reported, as error number and lost lines.
+class Failures {
 public:
-    [[nodiscard]] bool isEnabled(Ports::LogLevel) const noexcept override { return true; }
-    void write(Ports::LogLevel level, std::string_view text) noexcept override {
-        EXPECT_EQ(level, Ports::LogLevel::Error);
+    using List = std::vector<std::pair<int, std::size_t>>;
+
+    void add(int errorNumber, std::size_t lost) {
         const std::lock_guard lock(_mutex);
-        _records.emplace_back(text);
+        _list.emplace_back(errorNumber, lost);
         _changed.notify_all();
     }
-
-    void waitForRecord() {
+    void waitForOne() {
         std::unique_lock lock(_mutex);
-        _changed.wait(lock, [this] { return !_records.empty(); });
+        _changed.wait(lock, [this] { return !_list.empty(); });
     }
-    [[nodiscard]] std::vector<std::string> records() {
+    [[nodiscard]] List list() {
         const std::lock_guard lock(_mutex);
-        return _records;
+        return _list;
     }
 
 private:
     std::mutex _mutex;
     std::condition_variable _changed;
-    std::vector<std::string> _records;
+    List _list;
 };
 
 constexpr int kAll = 1'000'000;
 constexpr milliseconds kLong{60'000}; ///< only as long as something is wrong
 constexpr milliseconds kAtOnce{1};
 
-class EventStreamTest : public ::testing::Test {
+class AsyncWriterTest : public ::testing::Test {
 protected:
     static std::string droppedLine(std::uint64_t lines) { return "(" + std::to_string(lines) + " lost)\n"; }
 
@@ -126,19 +125,21 @@ protected:
     }
 
     std::shared_ptr<Reader> reader = std::make_shared<Reader>();
-    std::shared_ptr<NotedLog> log = std::make_shared<NotedLog>();
-    std::unique_ptr<EventStream> stream = std::make_unique<EventStream>(reader, droppedLine, log);
+    std::shared_ptr<Failures> failures = std::make_shared<Failures>();
+    std::unique_ptr<AsyncWriter> stream = std::make_unique<AsyncWriter>(
+        "zorva-print", reader, droppedLine,
+        [failures = failures](int errorNumber, std::size_t lost) { failures->add(errorNumber, lost); });
 };
 
-TEST_F(EventStreamTest, LinesComeOutInTheirOrder) {
+TEST_F(AsyncWriterTest, LinesComeOutInTheirOrder) {
     reader->allow(kAll);
     putNumbers(300);
     stream->finish(kLong);
     EXPECT_EQ(reader->text(), numbers(300));
-    EXPECT_THAT(log->records(), ElementsAre());
+    EXPECT_THAT(failures->list(), ElementsAre());
 }
 
-TEST_F(EventStreamTest, TheEndWritesWhatWaits) {
+TEST_F(AsyncWriterTest, TheEndWritesWhatWaits) {
     putFirst();
     putNumbers(3);
     reader->allow(kAll);
@@ -146,7 +147,7 @@ TEST_F(EventStreamTest, TheEndWritesWhatWaits) {
     EXPECT_EQ(reader->text(), "first\n" + numbers(3));
 }
 
-TEST_F(EventStreamTest, AThousandLinesWaitAndTheRestIsCounted) {
+TEST_F(AsyncWriterTest, AThousandLinesWaitAndTheRestIsCounted) {
     putFirst();
     putNumbers(1005);
     reader->allow(kAll);
@@ -154,7 +155,7 @@ TEST_F(EventStreamTest, AThousandLinesWaitAndTheRestIsCounted) {
     EXPECT_EQ(reader->text(), "first\n" + numbers(1000) + "(5 lost)\n");
 }
 
-TEST_F(EventStreamTest, LostLinesAreToldWhereTheyWouldHaveBeen) {
+TEST_F(AsyncWriterTest, LostLinesAreToldWhereTheyWouldHaveBeen) {
     putFirst();
     putNumbers(1002);
     reader->allow(1);
@@ -166,19 +167,18 @@ TEST_F(EventStreamTest, LostLinesAreToldWhereTheyWouldHaveBeen) {
     EXPECT_EQ(reader->text(), "first\n" + numbers(1000) + "(2 lost)\nlate\n(1 lost)\n");
 }
 
-TEST_F(EventStreamTest, AReaderThatIsGoneIsToldOnceInTheLog) {
+TEST_F(AsyncWriterTest, AReaderThatIsGoneIsReportedOnce) {
     reader->errorNumber = EPIPE;
     reader->allow(kAll);
     stream->put("a\n");
-    log->waitForRecord();
+    failures->waitForOne();
     putNumbers(10);
     stream->finish(kLong);
     EXPECT_EQ(reader->begun(), 1);
-    EXPECT_THAT(log->records(),
-                ElementsAre("standard output: cannot write: Broken pipe; nothing is shown any more"));
+    EXPECT_THAT(failures->list(), ElementsAre(std::pair(EPIPE, std::size_t{1})));
 }
 
-TEST_F(EventStreamTest, AReaderThatHangsDoesNotHangTheEnd) {
+TEST_F(AsyncWriterTest, AReaderThatHangsDoesNotHangTheEnd) {
     putFirst();
     putNumbers(2);
     stream->finish(kAtOnce);
@@ -187,11 +187,10 @@ TEST_F(EventStreamTest, AReaderThatHangsDoesNotHangTheEnd) {
     const std::future<void> gone = reader->gone(); // with the thread, which on a busy machine comes later
     reader.reset();
     gone.wait();
-    EXPECT_THAT(log->records(),
-                ElementsAre("standard output: its reader hangs; lines that it does not get: 3"));
+    EXPECT_THAT(failures->list(), ElementsAre(std::pair(ECANCELED, std::size_t{3})));
 }
 
-TEST_F(EventStreamTest, AWriteThatNothingEndsIsLeftBehind) {
+TEST_F(AsyncWriterTest, AWriteThatNothingEndsIsLeftBehind) {
     reader->canBeGivenUp = false;
     putFirst();
     putNumbers(2);
@@ -201,9 +200,42 @@ TEST_F(EventStreamTest, AWriteThatNothingEndsIsLeftBehind) {
     reader->allow(kAll); // or the thread would outlive the test
     reader.reset();
     gone.wait();
+    EXPECT_THAT(failures->list(), ElementsAre());
 }
 
-TEST_F(EventStreamTest, NothingIsTakenAfterTheEnd) {
+TEST_F(AsyncWriterTest, AThreadThatIsLeftBehindReportsNothing) {
+    reader->canBeGivenUp = false;
+    reader->errorNumber = EIO;
+    putFirst();
+    stream->finish(kAtOnce);
+    stream.reset();
+    const std::future<void> gone = reader->gone();
+    reader->allow(kAll);
+    reader.reset();
+    gone.wait();
+    EXPECT_THAT(failures->list(), ElementsAre());
+}
+
+TEST_F(AsyncWriterTest, LinesAreMadeOnTheWritersThread) {
+    reader->allow(kAll);
+    std::thread::id maker;
+    stream->put(AsyncWriter::Line([&] {
+        maker = std::this_thread::get_id();
+        return std::string("made\n");
+    }));
+    stream->finish(kLong);
+    EXPECT_EQ(reader->text(), "made\n");
+    EXPECT_NE(maker, std::this_thread::get_id());
+}
+
+TEST_F(AsyncWriterTest, LinesThatThereIsNoMemoryToPutAreCounted) {
+    reader->allow(kAll);
+    stream->drop();
+    stream->finish(kLong);
+    EXPECT_EQ(reader->text(), "(1 lost)\n");
+}
+
+TEST_F(AsyncWriterTest, NothingIsTakenAfterTheEnd) {
     reader->allow(kAll);
     stream->finish(kLong);
     stream->put("a\n");
@@ -212,7 +244,7 @@ TEST_F(EventStreamTest, NothingIsTakenAfterTheEnd) {
     EXPECT_EQ(reader->text(), "");
 }
 
-TEST_F(EventStreamTest, SeveralThreadsMayPut) {
+TEST_F(AsyncWriterTest, SeveralThreadsMayPut) {
     reader->allow(kAll);
     std::vector<std::thread> threads;
     for (int count = 0; count < 4; ++count)
@@ -224,4 +256,4 @@ TEST_F(EventStreamTest, SeveralThreadsMayPut) {
 }
 
 } // namespace
-} // namespace ZorvaTouch::Tools
+} // namespace ZorvaTouch::Host
