@@ -2,13 +2,13 @@
 
 #include "Host/Linux/SystemFailure.h"
 #include "Host/Linux/UniqueFd.h"
+#include "Shared/Util/Text.h"
 
 #include <fcntl.h>
 #include <unistd.h>
 
 #include <algorithm>
 #include <array>
-#include <cctype>
 #include <cerrno>
 #include <filesystem>
 #include <system_error>
@@ -40,10 +40,8 @@ std::string trimmed(std::string_view text) {
 
 /// A text as part of a line.
 std::string quoted(std::string_view text) {
-    std::string line(text.substr(0, kLongestQuote));
-    std::replace_if(
-        line.begin(), line.end(), [](unsigned char c) { return !std::isprint(c); }, '?');
-    return '"' + line + (text.size() > kLongestQuote ? "...\"" : "\"");
+    return '"' + Util::printable(text.substr(0, kLongestQuote)) +
+           (text.size() > kLongestQuote ? "...\"" : "\"");
 }
 
 /// What was read of a text, or word of a text that is none.

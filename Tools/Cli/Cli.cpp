@@ -40,14 +40,6 @@ struct Commands {
     }
 };
 
-/// Keeps a message one line of text, whatever a file's name or contents put into it.
-void appendInOneLine(std::string &text, std::string_view message) {
-    for (const char c : Util::repairUtf8(message)) {
-        const auto code = static_cast<unsigned char>(c);
-        text.push_back(code < 0x20 || code == 0x7F ? '?' : c);
-    }
-}
-
 void reportError(std::string_view message, Environment &environment) noexcept {
     try {
         environment.output.flush(); // what was done so far stays in order before the error
@@ -55,8 +47,7 @@ void reportError(std::string_view message, Environment &environment) noexcept {
     }
     try {
         std::string &text = environment.errorOutput.text();
-        appendInOneLine(text.append("zorvatouch: "), message);
-        text.push_back('\n');
+        text.append("zorvatouch: ").append(Util::printable(message)).append("\n");
         environment.errorOutput.flush();
     } catch (...) { // nobody is there to read it: the status must do
     }

@@ -131,9 +131,9 @@ public:
         } catch (const CLI::CallForVersion &) {
             return AnswerOptions{_app.version() + "\n"};
         } catch (const CLI::ParseError &error) {
-            throw CliError(oneLine(parseProblem(error)) + kHint);
+            throw CliError(Util::printable(parseProblem(error)) + kHint);
         } catch (const CliError &error) {
-            throw CliError(oneLine(error.what()) + kHint);
+            throw CliError(Util::printable(error.what()) + kHint);
         }
     }
 
@@ -148,14 +148,6 @@ private:
         if (!repeated.empty())
             return repeated.front()->get_name() + " may be given only once";
         return error.what();
-    }
-
-    /// Users' words are part of messages.
-    static std::string oneLine(const std::string &words) {
-        std::string text = Util::repairUtf8(words);
-        std::replace_if(
-            text.begin(), text.end(), [](char c) { return (c >= 0 && c < ' ') || c == '\x7F'; }, ' ');
-        return text;
     }
 
     CLI::Option &addOption(const char *group, const char *name, std::optional<std::string> &value,

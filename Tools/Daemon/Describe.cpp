@@ -109,7 +109,7 @@ std::string describeSystem(const DaemonOptions &options, const std::string &file
                            const std::function<void(std::string_view)> &say) {
     const PlugIn plugIn = openPlugIn(Linux::trustedPath(file));
     const bool hasUdev = Linux::detectMonitorSource() == Linux::MonitorSource::Udev;
-    return indentedJson(Util::jsonText(PropertyValue::Dictionary{
+    return indentedJson(withoutControls(Util::jsonText(PropertyValue::Dictionary{
         {"Program", ZORVA_VERSION},
         {"PlugIn", describePlugIn(plugIn)},
         {"DevicesFrom", hasUdev ? "udev" : "kernel"},
@@ -117,7 +117,7 @@ std::string describeSystem(const DaemonOptions &options, const std::string &file
         {"RealTime", allowedOr(Linux::tryRoundRobin(kRealTimePriority))},
         {"Accelerometers", describeAccelerometers()},
         {"Surfaces", describeSurfaces(options, plugIn, finder, say)},
-    }));
+    })));
 }
 
 } // namespace ZorvaTouch::Tools

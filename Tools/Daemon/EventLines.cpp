@@ -2,6 +2,7 @@
 
 #include "Shared/Util/Json.h"
 #include "Shared/Util/Text.h"
+#include "Tools/Daemon/IndentedJson.h"
 
 #include <array>
 
@@ -20,7 +21,9 @@ public:
     }
 
     Line &add(std::string_view key, std::string_view value) {
-        Util::appendJsonString(begin(key), value);
+        std::string shown;
+        Util::appendJsonString(shown, value);
+        begin(key).append(withoutControls(shown));
         return *this;
     }
     Line &add(std::string_view key, std::uint64_t value) {

@@ -65,4 +65,21 @@ std::string indentedJson(std::string_view json) {
     return indenter.text;
 }
 
+std::string withoutControls(std::string_view json) {
+    std::string text;
+    for (; !json.empty(); json.remove_prefix(1)) {
+        const auto lead = static_cast<unsigned char>(json.front());
+        const auto next = static_cast<unsigned char>(json.size() > 1 ? json[1] : ' ');
+        if (lead == 0x7F) {
+            text.append("\\u007f");
+        } else if (lead == 0xC2 && next >= 0x80 && next < 0xA0) {
+            text.append(next < 0x90 ? "\\u008" : "\\u009").push_back("0123456789abcdef"[next % 16U]);
+            json.remove_prefix(1);
+        } else {
+            text.push_back(json.front());
+        }
+    }
+    return text;
+}
+
 } // namespace ZorvaTouch::Tools

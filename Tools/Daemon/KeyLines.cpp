@@ -4,8 +4,6 @@
 #include "Tools/Cli/GestureLook.h"
 #include "Tools/Cli/Layout.h"
 
-#include <algorithm>
-
 namespace ZorvaTouch::Tools {
 namespace {
 
@@ -29,14 +27,6 @@ std::string right(std::string_view content, std::size_t width) {
     std::string text;
     appendRight(text, content, width);
     return text.append(kGap);
-}
-
-/// Somebody's text, without what controls a terminal.
-std::string printable(std::string_view text) {
-    std::string result = Util::repairUtf8(text);
-    std::replace_if(
-        result.begin(), result.end(), [](char c) { return (c >= 0 && c < ' ') || c == '\x7F'; }, '?');
-    return result;
 }
 
 std::string keyTitle(KeyCode code) {
@@ -70,7 +60,7 @@ std::string keyLine(const ShownKey &shown, bool usesColour) {
     const std::string_view change = shown.change.isPressed ? "down" : "up";
     appendColoured(line, change, shown.change.isPressed ? Colour::Bold : Colour::Dim, usesColour);
     if (!shown.surface.empty())
-        line.append(left("", kChangeWidth - change.size())).append(printable(shown.surface));
+        line.append(left("", kChangeWidth - change.size())).append(Util::printable(shown.surface));
     return finished(std::move(line));
 }
 

@@ -23,7 +23,7 @@ struct ShownKey {
 [[nodiscard]] std::string keyHeading(bool usesColour);
 
 /// A line with its line break: "    1.234 s  volume up     tap              KEY_VOLUMEUP        down".
-/// Characters that would do something to a terminal are shown as "?".
+/// Characters that control a terminal are escaped (`Util::printable`).
 /// @throws std::bad_alloc
 [[nodiscard]] std::string keyLine(const ShownKey &shown, bool usesColour);
 

@@ -66,13 +66,8 @@ constexpr std::string_view kNoKeyName = "none";
 constexpr std::array<std::string_view, kPixelRegionCount> kMapRegionNames{"", "play-pause", "volume-down",
                                                                           "volume-up"};
 
-/// A word of somebody's for a message of one line.
-std::string shown(std::string_view word) {
-    std::string text = Util::repairUtf8(quoted(word));
-    std::replace_if(
-        text.begin(), text.end(), [](char c) { return (c >= 0 && c < ' ') || c == '\x7F'; }, '?');
-    return text;
-}
+/// A user's word for a message of one line.
+std::string shown(std::string_view word) { return Util::printable(quoted(word)); }
 
 template <typename Names> std::string listOf(const Names &names) {
     std::string list;

@@ -165,7 +165,7 @@ TEST_F(Usage, WhatWasDoneBeforeAnErrorIsShown) {
 
 TEST_F(Usage, AnErrorStaysInOneLineWhateverTheNameHolds) {
     EXPECT_EQ(errorOf({"replay", "@a\nb\x1b[1m"}),
-              "zorvatouch: @a?b?[1m: cannot open: No such file or directory\n");
+              "zorvatouch: @a\\nb\\x1b[1m: cannot open: No such file or directory\n");
     EXPECT_EQ(errorOf({"replay", "@a\xff"}),
               "zorvatouch: @a\xEF\xBF\xBD: cannot open: No such file or directory\n");
 }

@@ -218,7 +218,7 @@ TEST(DaemonOptions, UnknownWordsAreRefused) {
     EXPECT_EQ(problemWith({"--loud"}), "'--loud' is no option");
     EXPECT_EQ(problemWith({"--acc", "none"}), "'--acc' is no option");
     EXPECT_EQ(problemWith({"--speed", "2"}), "'--speed' is no option");
-    EXPECT_EQ(problemWith({"a\nb\xFF"}), "'a b\xEF\xBF\xBD' is no option");
+    EXPECT_EQ(problemWith({"a\nb\xFF"}), "'a\\nb\xEF\xBF\xBD' is no option");
 }
 
 TEST(DaemonOptions, ValuesMustBeThere) {

@@ -30,5 +30,11 @@ TEST(IndentedJson, LeavesStringsAsTheyAre) {
     EXPECT_EQ(Util::parseJson(indentedJson(text)), Util::parseJson(text));
 }
 
+TEST(WithoutControls, EscapesWhatJsonAllowsInStrings) {
+    EXPECT_EQ(withoutControls("[\"a\x7F\xC2\x80\xC2\x9B\xC2\x9F\xC2\xA0\xC3\xA9\"]"),
+              "[\"a\\u007f\\u0080\\u009b\\u009f\xC2\xA0\xC3\xA9\"]");
+    EXPECT_EQ(withoutControls("{}"), "{}");
+}
+
 } // namespace
 } // namespace ZorvaTouch::Tools

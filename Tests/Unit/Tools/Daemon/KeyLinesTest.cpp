@@ -55,7 +55,7 @@ TEST(KeyLines, WhatADeviceIsCalledDoesNothingToATerminal) {
     ShownKey shown = tapDown();
     shown.surface = "a\x1b[2J\n\x7F\xFF";
     EXPECT_EQ(keyLine(shown, false), "    1.234 s  volume up    tap              KEY_VOLUMEUP        down  "
-                                     "a?[2J??\xEF\xBF\xBD\n");
+                                     "a\\x1b[2J\\n\\x7f\xEF\xBF\xBD\n");
 }
 
 TEST(KeyLines, CountWhatIsLost) {

@@ -114,7 +114,8 @@ TEST(KeyMap, SaysHowAnAssignmentIsWritten) {
 }
 
 TEST(KeyMap, ComplainsInOneReadableLine) {
-    EXPECT_EQ(problemWith("a\nb\x1B[1m\x7F:volume-up=none"), "'a?b?[1m?' is no gesture; there are tap, hold");
+    EXPECT_EQ(problemWith("a\nb\x1B[1m\x7F:volume-up=none"),
+              "'a\\nb\\x1b[1m\\x7f' is no gesture; there are tap, hold");
     EXPECT_EQ(problemWith("\xFF:volume-up=none"), "'\xEF\xBF\xBD' is no gesture; there are tap, hold");
     EXPECT_EQ(problemWith(std::string(1000, 'x') + ":volume-up=none"),
               "'" + std::string(40, 'x') + "...' is no gesture; there are tap, hold");
