@@ -52,6 +52,8 @@ void ListenerGroup::onRecording(const SurfaceName &surface, const std::string &f
 
 void LogListener::onSurface(const SurfaceName &surface, SurfaceState state,
                             std::string_view reason) noexcept {
+    if (state != SurfaceState::Failed)
+        _failures.erase(surface.id);
     switch (state) {
     case SurfaceState::Added:
         break; // what becomes of it comes next
@@ -62,7 +64,7 @@ void LogListener::onSurface(const SurfaceName &surface, SurfaceState state,
         _log.notice({surface.node, ": ", reason});
         break;
     case SurfaceState::Failed:
-        _log.error({surface.node, ": ", reason});
+        logFailure(surface, reason);
         break;
     case SurfaceState::Removed:
         _log.notice({surface.node, ": removed (", surface.id, ")"});
@@ -79,6 +81,15 @@ void LogListener::onQuarantine(const SurfaceName &surface, bool begins, std::uin
     else
         _log.notice({surface.node, ": its keys are pressed again; ", std::to_string(suppressed),
                      " presses were suppressed"});
+}
+
+void LogListener::logFailure(const SurfaceName &surface, std::string_view reason) noexcept {
+    try {
+        if (std::string &last = _failures[surface.id]; std::exchange(last, std::string(reason)) == reason)
+            return;
+    } catch (const std::bad_alloc &) { // rather a line too many
+    }
+    _log.error({surface.node, ": ", reason});
 }
 
 void LogListener::onSleep(bool begins) noexcept {

@@ -6,7 +6,10 @@
 #include "Tools/Daemon/DaemonLog.h"
 
 #include <cstdint>
+#include <map>
 #include <memory>
+#include <string>
+#include <string_view>
 #include <utility>
 #include <vector>
 
@@ -34,7 +37,8 @@ private:
 };
 
 /// Tells the log what is worth a line: not gestures and keys, which are somebody's private affair, nor
-/// accelerometers, of which whoever chooses them has told.
+/// accelerometers, of which whoever chooses them has told. A surface that cannot be opened is logged when
+/// that begins and when the reason changes, not at each retry.
 class LogListener final : public DaemonListener {
 public:
     explicit LogListener(DaemonLog log) : _log(std::move(log)) {}
@@ -46,7 +50,10 @@ public:
                      std::size_t reports) noexcept override;
 
 private:
+    void logFailure(const SurfaceName &surface, std::string_view reason) noexcept;
+
     const DaemonLog _log;
+    std::map<std::string, std::string> _failures; ///< reasons, by the surface's identity; the main thread's
 };
 
 /// Tells other programs, by the lines of `EventLines.h`. Lines that there is no memory for are lost.

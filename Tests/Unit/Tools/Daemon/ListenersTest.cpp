@@ -177,5 +177,24 @@ TEST_F(ListenersTest, AGroupTellsEach) {
     }
 }
 
+TEST_F(ListenersTest, TheLogHasAFailureOnceUntilItChanges) {
+    LogListener log{DaemonLog(logs, "Surfaces")};
+    const SurfaceName other{.id = "SN2", .node = "/dev/hidraw2", .name = "Touch"};
+    const std::string denied = "Surfaces error: /dev/hidraw1: open: Permission denied";
+    for (int i = 0; i < 3; ++i)
+        log.onSurface(surface, SurfaceState::Failed, "open: Permission denied");
+    EXPECT_EQ(logs.lines().count(denied), 1u);
+    log.onSurface(other, SurfaceState::Failed, "open: Permission denied");
+    EXPECT_EQ(logs.lines().count("Surfaces error: /dev/hidraw2: open: Permission denied"), 1u);
+    log.onSurface(surface, SurfaceState::Failed, "open: No such file or directory");
+    EXPECT_EQ(logs.lines().count("Surfaces error: /dev/hidraw1: open: No such file or directory"), 1u);
+    log.onSurface(surface, SurfaceState::Opened, {});
+    log.onSurface(surface, SurfaceState::Failed, "open: Permission denied");
+    EXPECT_EQ(logs.lines().count(denied), 2u);
+    log.onSurface(surface, SurfaceState::Removed, {});
+    log.onSurface(surface, SurfaceState::Failed, "open: Permission denied");
+    EXPECT_EQ(logs.lines().count(denied), 3u);
+}
+
 } // namespace
 } // namespace ZorvaTouch::Tools
