@@ -10,6 +10,7 @@ No surface is needed: all of it is simulated. Every wait is for the thing itself
 import json
 import os
 import pathlib
+import pty
 import resource
 import signal
 import subprocess
@@ -135,6 +136,33 @@ class Usage(unittest.TestCase):
         with Running("--no-keys", "--device", device) as daemon:
             daemon.wait_for_log(f"{device}: does not exist yet; waiting for it")
             self.assertEqual(daemon.end_by(signal.SIGTERM)[0], 0)
+
+    def test_a_thread_that_cannot_be_made_is_named_with_its_limit(self):
+        def limit():  # the first thread's stack does not fit
+            resource.setrlimit(resource.RLIMIT_STACK, (1 << 30, resource.getrlimit(resource.RLIMIT_STACK)[1]))
+            resource.setrlimit(resource.RLIMIT_AS, (1 << 29, 1 << 29))
+
+        done = run(*FINGER, preexec_fn=limit)
+        self.assertEqual((done.returncode, done.stdout), (1, ""), done.stderr)
+        self.assertRegex(done.stderr, r"zorvatouchd: cannot start the thread zorva-\S+; raise the limit of threads "
+                                      r"\(ulimit -u, TasksMax=\) or of memory \(ulimit -v, LimitAS=\)")
+
+    def test_people_do_not_see_errors_about_what_is_optional(self):
+        master, slave = pty.openpty()
+        done = run(*FINGER, "--duration", "0.95", stderr=slave)
+        os.close(slave)
+        os.set_blocking(master, False)
+        try:
+            shown = os.read(master, 65536).decode()
+        except (BlockingIOError, OSError):
+            shown = ""
+        os.close(master)
+        self.assertEqual(done.returncode, 0)
+        self.assertNotIn(" error ", shown)
+        logged = run(*FINGER, "--duration", "0.95").stderr
+        self.assertIn(" error subsystem=org.zorva.hid.ZorvaTouch category=HIDService "
+                      "Failed to create accel system: copyServices returned empty array\n", logged)
+        self.assertNotIn("\n\n", logged)
 
     def test_answers_do_without_anybody_who_reads_them(self):
         with open("/dev/full", "w", encoding="ascii") as full:

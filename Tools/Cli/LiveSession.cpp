@@ -2,6 +2,7 @@
 
 #include "Host/Simulated/Player.h"
 #include "Shared/Util/Ticks.h"
+#include "Tools/Hosting/ScreenLogs.h"
 
 #include <array>
 #include <chrono>
@@ -107,6 +108,8 @@ void LiveSession::setState(const Frame &frame) {
 /// On a screen the log waits until there is room for its lines.
 std::unique_ptr<Ports::LogProvider> LiveSession::openLogs(Environment &environment) {
     std::unique_ptr<Ports::LogProvider> logs = environment.openLogs(_options.logLevel);
+    if (_options.logLevel != Ports::LogLevel::Debug)
+        logs = std::make_unique<ScreenLogs>(std::move(logs));
     if (environment.screenColumns() == 0)
         return logs;
     auto deferred = std::make_unique<DeferredLogs>(std::move(logs));

@@ -9,14 +9,17 @@
 #include "Host/Runtime/SteadyClock.h"
 #include "Host/Runtime/StreamWriter.h"
 #include "Host/Runtime/Terminal.h"
+#include "Shared/Util/Text.h"
 #include "Tools/Cli/CliError.h"
 #include "Tools/Daemon/Daemon.h"
 #include "Tools/Daemon/Describe.h"
 #include "Tools/Hosting/ProgramFolder.h"
+#include "Tools/Hosting/ScreenLogs.h"
 
 #include <cstdlib>
 #include <exception>
 #include <memory>
+#include <new>
 #include <string>
 #include <string_view>
 #include <utility>
@@ -33,8 +36,11 @@ std::unique_ptr<Ports::LogProvider> openLogs(Ports::LogLevel level) {
     if (Linux::isJournalStream(static_cast<int>(Host::StandardStream::Error)))
         return std::make_unique<Host::AsyncLogs>(level, Linux::journalFormat(),
                                                  std::make_shared<Linux::JournalWriter>());
-    return std::make_unique<Host::AsyncLogs>(
+    std::unique_ptr<Ports::LogProvider> logs = std::make_unique<Host::AsyncLogs>(
         level, Host::logLine, std::make_shared<Host::StreamWriter>(Host::StandardStream::Error));
+    if (Host::isTerminal(Host::StandardStream::Error) && level != Ports::LogLevel::Debug)
+        logs = std::make_unique<Tools::ScreenLogs>(std::move(logs));
+    return logs;
 }
 
 Linux::HidrawOpener openerOf(const Linux::DeviceIdentity &device) {
@@ -79,7 +85,7 @@ void print(const std::string &text) { Host::writeStandard(Host::StandardStream::
 
 void complain(const std::string &text) {
     try {
-        Host::writeStandard(Host::StandardStream::Error, "zorvatouchd: " + text + "\n");
+        Host::writeStandard(Host::StandardStream::Error, "zorvatouchd: " + Util::printable(text) + "\n");
     } catch (const Host::FileFailure &) { // nobody is there to read it: the status must do
     }
 }
@@ -117,6 +123,9 @@ int main(int argc, char **argv) {
         return fail(error, kExitWrongUsage);
     } catch (const Tools::SurfaceInUse &error) {
         return fail(error, kExitInUse);
+    } catch (const std::bad_alloc &) {
+        complain("there is not enough memory to start; raise its limit (ulimit -v, LimitAS=, MemoryMax=)");
+        return kExitFailed;
     } catch (const std::exception &error) {
         return fail(error, kExitFailed);
     }
