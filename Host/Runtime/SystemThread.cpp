@@ -7,6 +7,7 @@
 
 #include <cstddef>
 #include <string>
+#include <system_error>
 #include <thread>
 #include <utility>
 
@@ -42,8 +43,14 @@ private:
 
 std::unique_ptr<Thread> startSystemThread(const char *name, std::function<void()> body) {
     const BlockedSignals blocked(allSignals()); // they are for the program's own threads
-    return std::make_unique<SystemThread>(std::string(name ? name : "").substr(0, kLongestName),
-                                          std::move(body));
+    const std::string shortName = std::string(name ? name : "").substr(0, kLongestName);
+    try {
+        return std::make_unique<SystemThread>(shortName, std::move(body));
+    } catch (const std::system_error &error) {
+        throw std::system_error(error.code(), "cannot start the thread " + shortName +
+                                                  "; raise the limit of threads (ulimit -u, TasksMax=) or of "
+                                                  "memory (ulimit -v, LimitAS=)");
+    }
 }
 
 int setRoundRobinPriorityOfThisThread(int priority) noexcept {
