@@ -208,22 +208,26 @@ TEST_F(PlugInOutOfMemory, AWriteToAStateIsRecordedWhollyOrNotAtAll) {
     (*hid)->scheduleWithDispatchQueue(hid, queue.get());
     const auto text = makeValue(kLongText);
     const auto number = makeValue(300.0);
-    for (const auto &[key, value] :
-         {std::pair{"Pipeline.Algs.ActivationThreshold", number.get()},
-          std::pair{"Pipeline.A key that is longer than a short string", text.get()}}) {
+    struct Write {
+        const char *key;
+        const ZorvaValue *value;
+    };
+    for (const Write &write : {Write{"Pipeline.Algs.ActivationThreshold", number.get()},
+                               Write{"Pipeline.A key that is longer than a short string", text.get()}}) {
         EXPECT_GT(forEachRefusal([&](Refusal &refusal) {
                       deliver(kLongReport); // or the next write would take this one's place
                       const std::vector<Frame> before = frames();
-                      const bool isDone =
-                          refusal.during([&] { return (*hid)->setProperty(hid, key, value); }) != 0;
+                      const bool isDone = refusal.during([&] {
+                          return (*hid)->setProperty(hid, write.key, write.value);
+                      }) != 0;
                       const std::vector<Frame> after = frames();
                       EXPECT_TRUE(isDone || refusal.hasHappened());
                       // What was recorded and then failed in the pipeline is in the recording, too.
                       const bool isRecorded = after.size() == before.size() + 1;
                       EXPECT_TRUE(isRecorded || (!isDone && after == before));
                       if (isRecorded) {
-                          EXPECT_EQ(after.back().key, std::string_view(key).substr(9));
-                          EXPECT_EQ(after.back().value, readValue(value));
+                          EXPECT_EQ(after.back().key, std::string_view(write.key).substr(9));
+                          EXPECT_EQ(after.back().value, readValue(write.value));
                       }
                   }),
                   0u);

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <initializer_list>
 #include <new>
 
 namespace ZorvaTouch::Testing {

@@ -407,7 +407,7 @@ TEST_F(Playback, MeasuresTimesFromTheHeadAsItIsAfterThePause) {
     expectFinished();
 }
 
-TEST_F(Playback, PlaysTheFrameInItsHandsWhenThePauseEmptiesTheList) {
+TEST_F(Playback, PlaysTheFrameItTookWhenThePauseEmptiesTheList) {
     append("R1@1000 R2@2000");
     clock.ticks = 100;
     recording.playReset();
