@@ -49,8 +49,8 @@ def check_reuse():
     other.touch("play/pause")
     other.unplug()
     expect("the surface is back at its node", node, surface.plug()["node"])
-    expect("the other device was not read, and the surface is opened again", {"surface failed"},
-           set(lines_until_opened(daemon)))
+    expect("the other device was not read, and the surface is opened again", set(),
+           set(lines_until_opened(daemon)) - {"surface failed"})
     daemon.end()
     expect("the other surface ends when it is told to", 0, other.finish())
     show_events()
