@@ -9,8 +9,6 @@
 namespace ZorvaTouch::Util {
 namespace {
 
-/// Where the electrodes lie, seen from the finger. A run of one letter is the field for that electrode's
-/// value. Electrodes with two pads (A to F, J and L) appear twice.
 constexpr std::array<std::string_view, 13> kSensorRows{
     "           HHHH      GGGG           ", "                IIII                ",
     "     BBBB                  AAAA     ", "         JJJJ          JJJJ         ",
@@ -55,6 +53,8 @@ void appendRow(std::string &text, std::string_view row, const InputReport::Image
 }
 
 } // namespace
+
+std::span<const std::string_view> sensorRows() noexcept { return kSensorRows; }
 
 std::string stringFromImage(const InputReport::Image &image, bool raw) {
     std::string text = "# Image frame ";

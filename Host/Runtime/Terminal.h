@@ -13,5 +13,7 @@ namespace ZorvaTouch::Host {
 
 /// Columns of the terminal behind a stream, as they are now; 0 if there is none or it does not say.
 [[nodiscard]] std::size_t terminalColumns(StandardStream stream) noexcept;
+/// Rows, likewise.
+[[nodiscard]] std::size_t terminalRows(StandardStream stream) noexcept;
 
 } // namespace ZorvaTouch::Host

@@ -35,8 +35,8 @@ struct Commands {
     ExitStatus operator()(const HostOptions &options) const { return runHost(options, environment); }
     ExitStatus operator()(const DemoOptions &options) const { return runDemo(options, environment); }
     ExitStatus operator()(const AnswerOptions &options) const {
-        environment.output.write(options.text);
-        return kExitDone;
+        (options.status == kExitDone ? environment.output : environment.errorOutput).write(options.text);
+        return options.status;
     }
 };
 
@@ -59,7 +59,10 @@ int runCli(std::span<const std::string> arguments, Environment &environment) noe
     try {
         const ExitStatus status = std::visit(Commands{environment}, parseOptions(arguments));
         environment.output.flush();
+        environment.errorOutput.flush();
         return status;
+    } catch (const ClosedPipe &) {
+        return kExitClosedPipe;
     } catch (const std::bad_alloc &) {
         reportError("out of memory", environment);
     } catch (const std::exception &error) {

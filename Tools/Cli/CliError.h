@@ -1,5 +1,6 @@
 #pragma once
 
+#include <exception>
 #include <stdexcept>
 #include <string>
 #include <string_view>
@@ -14,6 +15,12 @@ namespace ZorvaTouch::Tools {
 class CliError : public std::runtime_error {
 public:
     using std::runtime_error::runtime_error;
+};
+
+/// The reader of a pipe has closed it, as `head` does: the program ends without a message.
+class ClosedPipe : public std::exception {
+public:
+    [[nodiscard]] const char *what() const noexcept override { return "the reader has closed the pipe"; }
 };
 
 /// A failed operation on a file, as "NAME: cannot open: No such file or directory".

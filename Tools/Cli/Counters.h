@@ -17,7 +17,8 @@ struct Counters {
     std::uint64_t disjointImages = 0;
 };
 
-/// Appends the four lines that end a recording or a run: events, dispatched, rejected, device.
+/// Appends the lines that end a recording or a run: events, and what is not 0 of recognized, rejected and
+/// device.
 void appendCounters(std::string &text, const Counters &counters);
 
 /// Appends the beginning of such a line, "  events        ".

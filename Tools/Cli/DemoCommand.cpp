@@ -2,6 +2,7 @@
 
 #include "Tools/Cli/CliError.h"
 #include "Tools/Cli/DemoSummary.h"
+#include "Tools/Cli/Layout.h"
 #include "Tools/Cli/LiveJson.h"
 #include "Tools/Cli/LiveReport.h"
 #include "Tools/Cli/LiveTable.h"
@@ -11,12 +12,18 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <string_view>
 #include <system_error>
 
 namespace ZorvaTouch::Tools {
 namespace {
 
 constexpr const char *kRecordingName = "zorvatouch-demo.json";
+
+/// What the table does not say by itself.
+constexpr std::string_view kLegend =
+    "ms: since the touch began. touch withdrawn: it is neither tap nor hold.\n"
+    "volume up ...: repeats until the hold ends. (missed): should be a gesture.\n";
 
 /// Where the recording goes unless told, in a folder that is made when it is not there.
 std::string defaultRecordingFile(const std::filesystem::path &folder) {
@@ -55,6 +62,9 @@ public:
         if (_options.json || _options.quiet)
             return play(printer.get(), nullptr);
         writeHeading(_session.service(), titleOf(_options.finger), _environment);
+        const std::size_t columns = _environment.screenColumns();
+        if (columns == 0 || columns >= kTextColumns) // a narrower table has no columns to explain
+            appendColoured(_environment.output.text(), kLegend, Colour::Dim, _environment.usesColour);
         FingerTruth truth(_options.finger);
         return play(printer.get(), &truth);
     }

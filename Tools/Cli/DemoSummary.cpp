@@ -25,9 +25,9 @@ std::string scopeText(const std::optional<std::uint64_t> &comparedFromNs) {
     if (!comparedFromNs)
         return {};
     if (*comparedFromNs == kNothingCompared)
-        return "; older reports were trimmed, and no touch since then can be compared";
-    return " from " + fixedPointText(static_cast<std::int64_t>(*comparedFromNs), kNanosecondsPerSecond) +
-           " s on; older reports were trimmed";
+        return "older reports are trimmed, no later touch can be compared";
+    return "from " + fixedPointText(static_cast<std::int64_t>(*comparedFromNs), kNanosecondsPerSecond) +
+           " s on; older reports are trimmed";
 }
 
 void appendDifference(std::string &text, const ReplayDifference &difference) {
@@ -47,7 +47,11 @@ void appendProof(std::string &text, const DemoSummary &summary, bool usesColour)
                        Colour::Yellow, usesColour);
     else
         appendColoured(text, "the same " + countText(proof.events, "event"), Colour::Green, usesColour);
-    text.append(scopeText(summary.comparedFromNs)).append("\n");
+    text.append("\n");
+    if (const std::string scope = scopeText(summary.comparedFromNs); !scope.empty()) {
+        appendSummaryLabel(text, "");
+        text.append(scope).append("\n");
+    }
     if (proof.difference)
         appendDifference(text, *proof.difference);
 }

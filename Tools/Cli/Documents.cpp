@@ -3,6 +3,7 @@
 #include "Host/Runtime/Files.h"
 #include "Tools/Cli/CliError.h"
 
+#include <cerrno>
 #include <cstdint>
 #include <utility>
 
@@ -79,6 +80,8 @@ void writeDocument(const std::string &name, std::string_view text, Environment &
     try {
         Host::replaceFile(name, text);
     } catch (const Host::FileFailure &failure) {
+        if (failure.code().value() == EPIPE)
+            throw ClosedPipe();
         throw fileError(shown(name), failure);
     }
 }

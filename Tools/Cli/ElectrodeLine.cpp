@@ -1,6 +1,7 @@
 #include "Tools/Cli/ElectrodeLine.h"
 
 #include "Shared/Pixel.h"
+#include "Shared/SensorPicture.h"
 #include "Tools/Cli/GestureLook.h"
 #include "Tools/Cli/Layout.h"
 
@@ -75,7 +76,66 @@ void appendElectrodes(std::string &text, const Values &values, std::size_t cellW
     }
 }
 
+// --- The picture
+
+constexpr std::size_t kLegendColumns = 40;
+constexpr std::size_t kTimeRow = 1;
+constexpr std::size_t kRegionRow = 2;
+constexpr std::size_t kLegendRow = 5;
+constexpr std::array<std::string_view, 3> kLegend{
+    "A to O  electrodes at their places", "▁ to █  weak to firm touch", "colour  the touched region:"};
+
+/// One row of the sensor. A run of one letter becomes the letter and a bar.
+void appendSensorRow(std::string &text, std::string_view row, const Values &values, bool usesColour) {
+    const PixelRegion active = activeRegion(values);
+    for (std::size_t at = 0; at < row.size();) {
+        const std::size_t end = row.find_first_not_of(row[at], at);
+        const std::size_t length = std::min(end, row.size()) - at;
+        if (row[at] == ' ') {
+            text.append(length, ' ');
+        } else {
+            const auto electrode = static_cast<std::size_t>(row[at] - 'A');
+            std::string field(1, row[at]);
+            for (std::size_t i = 1; i < length; ++i)
+                field.append(barOf(values[electrode]));
+            const bool isActive = active != kPixelRegionNone && regionOfIndex(electrode) == active;
+            appendColoured(text, field, isActive ? kRegionColours[active] : Colour::Dim, usesColour);
+        }
+        at += length;
+    }
+}
+
+/// What stands beside a row of the sensor.
+void appendBeside(std::string &text, std::size_t row, std::uint64_t timeNs, PixelRegion active,
+                  bool usesColour) {
+    if (row == kTimeRow)
+        text.append("  ").append(timeText(timeNs));
+    else if (row == kRegionRow && active != kPixelRegionNone)
+        appendColoured(text.append("  "), titleOf(active), kRegionColours[active], usesColour);
+    else if (row >= kLegendRow && row < kLegendRow + kLegend.size())
+        appendColoured(text.append("  "), kLegend[row - kLegendRow], Colour::Dim, usesColour);
+    else if (row == kLegendRow + kLegend.size())
+        for (const auto region : {kPixelRegionPlayPause, kPixelRegionVolumeDown, kPixelRegionVolumeUp})
+            appendColoured(text.append("  "), titleOf(region), kRegionColours[region], usesColour);
+}
+
 } // namespace
+
+std::string electrodePicture(const InputReport::Image &image, std::uint64_t timeNs, std::size_t columns,
+                             bool usesColour) {
+    if (columns < kPictureColumns)
+        return {};
+    const Values values = scaledValues(image);
+    const auto rows = Util::sensorRows();
+    std::string text;
+    for (std::size_t row = 0; row < rows.size(); ++row) {
+        text.append(row == 0 ? "" : "\n");
+        appendSensorRow(text, rows[row], values, usesColour);
+        if (columns >= kPictureColumns + kLegendColumns)
+            appendBeside(text, row, timeNs, activeRegion(values), usesColour);
+    }
+    return text;
+}
 
 std::string electrodeLine(const InputReport::Image &image, std::uint64_t timeNs, std::size_t columns,
                           bool usesColour) {

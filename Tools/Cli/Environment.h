@@ -28,6 +28,8 @@ struct Environment {
     /// Columns of the terminal that standard output is, if one line of it can be drawn again and again; 0 if
     /// not.
     std::function<std::size_t()> screenColumns = [] { return std::size_t{0}; };
+    /// Its rows; 0 if unknown, or not such a terminal.
+    std::function<std::size_t()> screenRows = [] { return std::size_t{0}; };
     /// Has `onStop` called, at most once and on any thread, when the user wants an end; until the result is
     /// let go of. Called before other threads are started.
     std::function<std::shared_ptr<void>(std::function<void()> onStop)> watchStop =

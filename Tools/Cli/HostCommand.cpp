@@ -11,6 +11,7 @@
 
 #include <memory>
 #include <optional>
+#include <string_view>
 #include <utility>
 #include <variant>
 
@@ -36,11 +37,12 @@ public:
                 return tellRefusal(setting.key);
         if (_source)
             play();
+        bool hasAll = true;
         for (const std::string &key : _options.gets)
-            printProperty(key);
+            hasAll = printProperty(key) && hasAll;
         if (_options.saveFile)
             save(*_options.saveFile);
-        return kExitDone;
+        return hasAll ? kExitDone : kExitCheckFailed;
     }
 
 private:
@@ -59,11 +61,16 @@ private:
     }
 
     ExitStatus tellRefusal(const std::string &key) {
-        std::string text("zorvatouch: --set: the service refuses ");
-        Util::appendJsonString(text, key);
+        complain("--set: the service refuses ", key);
+        return kExitCheckFailed;
+    }
+
+    void complain(std::string_view problem, const std::string &key) {
+        _environment.output.flush(); // what was done so far stays in order before the error
+        std::string text("zorvatouch: ");
+        Util::appendJsonString(text.append(problem), key);
         _environment.errorOutput.write(text.append("\n"));
         _environment.errorOutput.flush();
-        return kExitCheckFailed;
     }
 
     void play() {
@@ -83,22 +90,22 @@ private:
         return std::make_unique<LiveTable>(_environment, false);
     }
 
-    void printProperty(const std::string &key) {
+    /// @return Whether there is such a property.
+    [[nodiscard]] bool printProperty(const std::string &key) {
         const std::optional<PropertyValue> value = _session.service().property(key);
         std::string &text = _environment.output.text();
         if (_options.json) {
             Util::appendJsonString(text.append(R"({"property":)"), key);
             Util::appendJson(text.append(R"(,"value":)"), value.value_or(PropertyValue()), 2);
             text.append("}\n");
-        } else {
-            text.append(key).append(": ");
-            if (value)
-                appendReadable(text, *value);
-            else
-                text.append("no such property");
+        } else if (value) {
+            appendReadable(text.append(key).append(": "), *value);
             text.append("\n");
         }
         _environment.output.wrote();
+        if (!value)
+            complain("--get: the service does not have a property ", key);
+        return value.has_value();
     }
 
     void save(const std::string &file) {

@@ -36,6 +36,21 @@ void appendRight(std::string &text, std::string_view content, std::size_t width)
     text.append(blanksFor(content, width), ' ').append(content);
 }
 
+void appendWrapped(std::string &text, std::string_view line, std::size_t column, std::string_view separator) {
+    const std::size_t width = kTextColumns - column;
+    const std::size_t shown = separator.size() - 1; // of the separator, at the end of a line
+    while (widthOf(line) > width) {
+        std::size_t end = line.rfind(separator, width - shown);
+        if (end == std::string_view::npos || line.find_first_not_of(' ') > end)
+            end = line.find(separator, width);
+        if (end == std::string_view::npos)
+            break;
+        text.append(line.substr(0, end + shown)).append("\n").append(column, ' ');
+        line.remove_prefix(end + separator.size());
+    }
+    text.append(line);
+}
+
 std::size_t widthOf(std::string_view text) noexcept {
     const auto continues = [](char c) { return (static_cast<unsigned char>(c) & 0xC0u) == 0x80u; };
     return text.size() - static_cast<std::size_t>(std::count_if(text.begin(), text.end(), continues));

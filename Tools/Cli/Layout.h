@@ -17,6 +17,14 @@ void appendLeft(std::string &text, std::string_view content, std::size_t width);
 /// Appends blanks up to a width and text.
 void appendRight(std::string &text, std::string_view content, std::size_t width);
 
+/// Columns that help and summaries may take.
+inline constexpr std::size_t kTextColumns = 80;
+/// Appends a line of words that begins at a column, wrapped at `kTextColumns`; further lines begin at the
+/// same column. One that fits stays as it is; a word that does not fit stays whole.
+/// @param separator  What may stand at the end of a line: " ", or ", " in a list whose items stay whole.
+void appendWrapped(std::string &text, std::string_view line, std::size_t column,
+                   std::string_view separator = " ");
+
 /// Characters in UTF-8 text.
 [[nodiscard]] std::size_t widthOf(std::string_view text) noexcept;
 

@@ -26,7 +26,7 @@ void hurry(Synth::Parameters &parameters) {
 }
 
 void addPlugIn(CLI::App &command, std::optional<std::string> &plugIn) {
-    command.add_option("--plugin", plugIn, "The plug-in's file; the one beside the program unless given")
+    command.add_option("--plugin", plugIn, "The plug-in's file (default: the one beside the program)")
         ->type_name("PATH");
 }
 
@@ -36,25 +36,27 @@ void HostArguments::declare(CLI::App &command) {
     addPlugIn(command, _plugIn);
     command.add_option("--device", _device, "What to play: sim:SCENARIO or recording:FILE")
         ->type_name("DEVICE");
-    command.add_option("--seed", _seed, "Of sim: the same gives the same finger; 1 unless given")
+    command.add_option("--seed", _seed, "Of sim: the same seed gives the same finger (default: 1)")
         ->type_name("N");
-    command.add_option("--duration", _duration, "Of sim: in seconds; the scenario's unless given")
-        ->type_name("S");
-    command.add_option("--speed", _speed, "Pace: 1 is live; in virtual time, without pauses, unless given")
+    command.add_option("--duration", _duration, "Of sim: seconds (default: the scenario's)")->type_name("S");
+    command
+        .add_option("--speed", _speed, "Speed factor, 1 is live (default: inf, virtual time without pauses)")
         ->type_name("X");
     command
         .add_option("--set", _settings,
-                    "Write a property first, as --set Pipeline.Algs.ActivationThreshold=250")
+                    "Set a property first, as --set Pipeline.Algs.ActivationThreshold=250 (may be repeated)")
         ->type_name("KEY=VALUE")
         ->allow_extra_args(false);
-    command.add_option("--get", _gets, "Read a property afterwards, as --get Pipeline.DebugInfo")
+    command
+        .add_option("--get", _gets,
+                    "Get a property afterwards, as --get Pipeline.DebugInfo (may be repeated)")
         ->type_name("KEY")
         ->allow_extra_args(false);
-    command.add_option("--save", _save, "Write what the service has recorded")->type_name("FILE");
+    command.add_option("--save", _save, "Write the service's recording")->type_name("FILE");
     command.add_flag("--json", _json, "Write lines of JSON");
     command
         .add_option("--log-level", _logLevel,
-                    "Log to standard error: debug, default or error (as if not given)")
+                    "Log to standard error: debug, default or error (default: error)")
         ->type_name("LEVEL");
 }
 
@@ -103,16 +105,20 @@ SimulatedFinger HostArguments::readFinger(const std::string &scenario) const {
 
 void DemoArguments::declare(CLI::App &command) {
     addPlugIn(command, _plugIn);
-    command.add_option("--scenario", _scenario, "What the finger does; day, in a hurry, unless given")
+    command.add_option("--scenario", _scenario, "What the finger does (default: day, with short pauses)")
         ->type_name("NAME");
-    command.add_option("--seed", _seed, "The same gives the same finger; 1811 unless given")->type_name("N");
-    command.add_option("--duration", _duration, "In seconds; 20 unless given")->type_name("S");
-    command.add_flag("--forever", _forever, "Until Ctrl-C");
-    command.add_option("--speed", _speed, "Pace: 1 is live, as if not given; inf is without pauses")
+    command.add_option("--seed", _seed, "The same seed gives the same finger (default: 1811)")
+        ->type_name("N");
+    command.add_option("--duration", _duration, "Seconds (default: 20)")->type_name("S");
+    command.add_flag("--forever", _forever, "Run until Ctrl-C");
+    command.add_option("--speed", _speed, "Speed factor, 1 is live, inf has no pauses (default: 1)")
         ->type_name("X");
-    command.add_flag("--quiet", _quiet, "Only the end");
+    command.add_flag("--quiet", _quiet, "Show only the summary");
     command.add_flag("--json", _json, "Write lines of JSON");
-    command.add_option("--save", _save, "Where to write what the service has recorded")->type_name("FILE");
+    command
+        .add_option("--save", _save,
+                    "Where to write the recording (default: zorvatouch-demo.json below XDG_STATE_HOME)")
+        ->type_name("FILE");
 }
 
 DemoOptions DemoArguments::read() const {

@@ -9,6 +9,7 @@
 
 #include <algorithm>
 #include <exception>
+#include <filesystem>
 
 namespace ZorvaTouch::Tools {
 namespace {
@@ -37,9 +38,10 @@ std::string titleOf(const SimulatedFinger &finger) {
 }
 
 void writeHeading(const HostedService &service, const std::string &device, Environment &environment) {
-    const std::string heading = service.file() + " " + service.version() + ": " + device;
+    const std::string heading =
+        std::filesystem::path(service.file()).filename().string() + ", service version " + service.version();
     appendColoured(environment.output.text(), heading, Colour::Bold, environment.usesColour);
-    environment.output.write("\n");
+    environment.output.write("\n" + device + "\n");
     environment.output.flush();
 }
 

@@ -4,6 +4,7 @@
 #include "Tools/Cli/GestureLook.h"
 #include "Tools/Cli/Layout.h"
 
+#include <string>
 #include <string_view>
 #include <utility>
 
@@ -20,6 +21,8 @@ constexpr std::size_t kGestureWidth = 16;
 constexpr std::size_t kRegionWidth = 11;
 constexpr std::size_t kDurationWidth = 6;
 constexpr std::size_t kActionWidth = 16;
+constexpr std::size_t kTableWidth = 79;
+constexpr std::size_t kRowsAbovePicture = 6; ///< for gestures, at least
 
 std::string timeText(std::uint64_t timeNs) {
     return fixedPointText(static_cast<std::int64_t>(timeNs), kNanosecondsPerSecond);
@@ -69,20 +72,23 @@ void LiveTable::refresh(std::uint64_t timeNs, const std::optional<InputReport::I
     // The last column stays free: a terminal may go on to the next line behind it.
     const std::size_t columns = _environment.screenColumns();
     if (columns > 1 && image) {
-        eraseLine();
-        _environment.output.write(electrodeLine(*image, timeNs, columns - 1, _environment.usesColour));
-        _isLineVisible = true;
+        const bool hasPicture =
+            columns > kPictureColumns && _environment.screenRows() >= kPictureRows + kRowsAbovePicture;
+        eraseElectrodes();
+        _environment.output.write((hasPicture ? electrodePicture : electrodeLine)(*image, timeNs, columns - 1,
+                                                                                  _environment.usesColour));
+        _visibleLines = hasPicture ? kPictureRows : 1;
     }
     _environment.output.flush();
 }
 
 void LiveTable::clear() {
-    eraseLine();
+    eraseElectrodes();
     _environment.output.flush();
 }
 
 void LiveTable::beginRow() {
-    eraseLine();
+    eraseElectrodes();
     if (std::exchange(_hasRows, true))
         return;
     std::string row;
@@ -105,6 +111,10 @@ void LiveTable::appendCells(std::string &row, const Cells &cells, Colour gesture
     appendLeft(gesture, cells.gesture, kGestureWidth);
     appendRight(row, cells.time, kTimeWidth);
     appendColoured(row.append(kGap), gesture, gestureColour, usesColour);
+    if (isNarrow()) {
+        row.append(cells.region).append("\n");
+        return;
+    }
     appendLeft(row, cells.region, kRegionWidth);
     appendRight(row, cells.duration, kDurationWidth);
     row.append(kGap);
@@ -115,9 +125,18 @@ void LiveTable::appendCells(std::string &row, const Cells &cells, Colour gesture
     row.append(_showsFinger ? cells.finger : std::string_view()).append("\n");
 }
 
-void LiveTable::eraseLine() {
-    if (std::exchange(_isLineVisible, false))
-        _environment.output.text().append(kEraseLine);
+void LiveTable::eraseElectrodes() {
+    const std::size_t lines = std::exchange(_visibleLines, 0);
+    std::string &text = _environment.output.text();
+    if (lines > 1)
+        text.append("\r\x1b[").append(std::to_string(lines - 1)).append("A\x1b[J");
+    else if (lines == 1)
+        text.append(kEraseLine);
+}
+
+bool LiveTable::isNarrow() const {
+    const std::size_t columns = _environment.screenColumns();
+    return columns > 0 && columns <= kTableWidth;
 }
 
 } // namespace ZorvaTouch::Tools

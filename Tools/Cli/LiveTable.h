@@ -4,13 +4,16 @@
 #include "Tools/Cli/Layout.h"
 #include "Tools/Cli/LivePrinter.h"
 
+#include <cstddef>
 #include <string_view>
 
 namespace ZorvaTouch::Tools {
 
-/// Prints a run for a person: a row for each gesture, and on a screen the electrodes below.
+/// Prints a run for a person: a row for each gesture, and on a screen the electrodes below: at their places
+/// on the sensor if there are rows for that, else in a line. A screen narrower than the table gets its first
+/// columns.
 ///
-/// Whatever else is printed meanwhile must come after `clear`: the lowest line is drawn anew all the time.
+/// Whatever else is printed meanwhile must come after `clear`: the lowest lines are drawn again all the time.
 class LiveTable final : public LivePrinter {
 public:
     /// @param environment  Borrowed. Its output is written to.
@@ -34,12 +37,13 @@ private:
 
     void beginRow();
     void appendCells(std::string &row, const Cells &cells, Colour gestureColour, bool usesColour) const;
-    void eraseLine();
+    void eraseElectrodes();
+    [[nodiscard]] bool isNarrow() const;
 
     Environment &_environment;
     const bool _showsFinger;
     bool _hasRows = false;
-    bool _isLineVisible = false;
+    std::size_t _visibleLines = 0; ///< of electrodes
 };
 
 } // namespace ZorvaTouch::Tools

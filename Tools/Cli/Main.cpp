@@ -40,6 +40,11 @@ std::size_t screenColumns() {
     return columns > 0 ? columns : kUsual;
 }
 
+std::size_t screenRows() {
+    return Host::isScreen(Host::StandardStream::Output) ? Host::terminalRows(Host::StandardStream::Output)
+                                                        : 0;
+}
+
 /// Where programs keep what outlives a run, as freedesktop.org has it; the current folder without a home.
 std::string stateFolder() {
     if (variable("XDG_STATE_HOME").starts_with('/'))
@@ -69,6 +74,7 @@ int main(int argc, char **argv) {
         .usesColour = Host::showsColours(Host::StandardStream::Output),
         .showsProgress = Host::isTerminal(Host::StandardStream::Error),
         .screenColumns = screenColumns,
+        .screenRows = screenRows,
         .watchStop =
             [](std::function<void()> onStop) {
                 return std::make_shared<Host::StopSignals>(std::move(onStop));

@@ -1,10 +1,11 @@
 #include "Tools/Cli/OptionValues.h"
 
-#include "Shared/Algs.h"
+#include "Shared/StateKeys.h"
 #include "Shared/Util/Json.h"
 #include "Shared/Util/StateKey.h"
 #include "Shared/Util/Text.h"
 #include "Tools/Cli/CliError.h"
+#include "Tools/Cli/Suggestion.h"
 
 #include <array>
 #include <charconv>
@@ -13,15 +14,16 @@
 namespace ZorvaTouch::Tools {
 namespace {
 
-/// A whole text as a number; false if it is none or out of range.
+/// A whole text as a number; false if it is not one or out of range.
 template <typename Number> bool readNumber(std::string_view text, Number &number) {
     const char *const end = text.data() + text.size();
     const auto [stop, error] = std::from_chars(text.data(), end, number);
     return error == std::errc() && stop == end;
 }
 
+/// @param problem  What follows the value: " must be an integer >= 1".
 [[noreturn]] void refuse(std::string_view option, std::string_view text, const std::string &problem) {
-    throw CliError(std::string(option) + ": '" + std::string(text) + "' is " + problem);
+    throw CliError(std::string(option) + ": '" + std::string(text) + "'" + problem);
 }
 
 constexpr double kShortestDuration = 0.1;
@@ -35,21 +37,50 @@ constexpr std::array<LogLevelName, 3> kLogLevelNames{{{"debug", Ports::LogLevel:
                                                       {"default", Ports::LogLevel::Default},
                                                       {"error", Ports::LogLevel::Error}}};
 
+constexpr std::string_view kPipelineDomain = "Pipeline";
+constexpr std::string_view kRecognizerDomain = "Algs";
+
+/// A value as it was typed, or nearly so.
+std::string shownValue(const PropertyValue &value) {
+    const std::string *const text = value.asString();
+    return text ? *text : Util::jsonText(value);
+}
+
 /// KEY=VALUE, the key as it stands.
 Setting splitSetting(std::string_view text) {
     const std::size_t sign = text.find('=');
     if (sign == std::string_view::npos)
-        refuse("--set", text, "not KEY=VALUE");
+        refuse("--set", text, " must be KEY=VALUE");
     const std::string_view value = text.substr(sign + 1);
     return {std::string(text.substr(0, sign)), Util::parseJson(value).value_or(PropertyValue(value))};
+}
+
+std::string joined(std::span<const std::string_view> names) {
+    std::string text;
+    for (const std::string_view name : names)
+        text.append(text.empty() ? "" : ", ").append(name);
+    return text;
 }
 
 /// The recognizer's key: as the service has it, each domain may be left out.
 std::string recognizerKey(std::string_view key) {
     std::string rest(key);
-    for (const char *domain : {"Pipeline", "Algs"})
+    for (const std::string_view domain : {kPipelineDomain, kRecognizerDomain})
         static_cast<void>(Util::stripDomainFromKey(rest, domain));
     return rest;
+}
+
+/// @param setting  With the recognizer's key.
+/// @param key      As it was typed.
+/// @throws CliError  The key cannot be written, or the value is not one for it.
+void requireState(const Setting &setting, const std::string &key) {
+    const auto range = stateRange(setting.key);
+    if (!range)
+        refuse("--set", key,
+               " is not a writable state key" + suggestion(setting.key, writableStateKeys(),
+                                                           "; writable are " + joined(writableStateKeys())));
+    if (!range->contains(setting.value))
+        refuse("--set " + key, shownValue(setting.value), " must be " + range->text());
 }
 
 } // namespace
@@ -57,14 +88,14 @@ std::string recognizerKey(std::string_view key) {
 std::uint64_t parseCount(std::string_view option, std::string_view text, std::uint64_t lowest) {
     std::uint64_t count = 0;
     if (!readNumber(text, count) || count < lowest)
-        refuse(option, text, "no whole number from " + std::to_string(lowest) + " on");
+        refuse(option, text, " must be an integer >= " + std::to_string(lowest));
     return count;
 }
 
 float parseSpeed(std::string_view text) {
     float speed = 0;
     if (!readNumber(text, speed) || !(speed > 0.0f)) // a NaN is refused too
-        refuse("--speed", text, "no number above 0");
+        refuse("--speed", text, " must be a number > 0");
     return speed;
 }
 
@@ -72,7 +103,7 @@ Ports::LogLevel parseLogLevel(std::string_view text) {
     for (const LogLevelName &entry : kLogLevelNames)
         if (entry.name == text)
             return entry.level;
-    refuse("--log-level", text, "none of debug, default, error");
+    refuse("--log-level", text, " must be debug, default or error");
 }
 
 double parseQuantity(std::string_view option, std::string_view text, double lowest, double highest,
@@ -80,7 +111,7 @@ double parseQuantity(std::string_view option, std::string_view text, double lowe
     double value = 0;
     if (!readNumber(text, value) || !(value >= lowest && value <= highest)) // a NaN is refused too
         refuse(option, text,
-               "no number from " + numberText(lowest) + " to " + numberText(highest) + " (" +
+               " must be a number from " + numberText(lowest) + " to " + numberText(highest) + " (" +
                    std::string(unit) + ")");
     return value;
 }
@@ -89,17 +120,20 @@ double parseDuration(std::string_view text) {
     return parseQuantity("--duration", text, kShortestDuration, kLongestDuration, "s");
 }
 
-std::string scenarioNames() {
-    std::string names;
+std::vector<std::string_view> scenarioNameList() {
+    std::vector<std::string_view> names;
     for (const Synth::Scenario &scenario : Synth::scenarios())
-        names.append(names.empty() ? "" : ", ").append(scenario.name);
+        names.push_back(scenario.name);
     return names;
 }
+
+std::string scenarioNames() { return joined(scenarioNameList()); }
 
 const Synth::Scenario &parseScenario(std::string_view option, std::string_view text) {
     if (const Synth::Scenario *const scenario = Synth::scenarioNamed(text))
         return *scenario;
-    refuse(option, text, "no scenario; there are " + scenarioNames());
+    refuse(option, text,
+           " is not a scenario" + suggestion(text, scenarioNameList(), "; scenarios are " + scenarioNames()));
 }
 
 std::string numberText(double value) {
@@ -111,15 +145,19 @@ std::string numberText(double value) {
 Setting parseSetting(std::string_view text) {
     Setting setting = splitSetting(text);
     const std::string key = std::exchange(setting.key, recognizerKey(setting.key));
-    if (!Algs::isWritableKey(setting.key))
-        refuse("--set", key, "no state key that can be written");
+    requireState(setting, key);
     return setting;
 }
 
 Setting parseProperty(std::string_view text) {
     Setting setting = splitSetting(text);
     if (setting.key.empty())
-        refuse("--set", text, "not KEY=VALUE");
+        refuse("--set", text, " must be KEY=VALUE");
+    std::string rest = setting.key;
+    if (Util::stripDomainFromKey(rest, kPipelineDomain))
+        requireState({recognizerKey(setting.key), setting.value}, setting.key);
+    else if (stateRange(rest))
+        refuse("--set", rest, " is a state key; with its domains it is Pipeline.Algs." + rest);
     return setting;
 }
 

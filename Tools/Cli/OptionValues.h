@@ -7,6 +7,7 @@
 #include <cstdint>
 #include <string>
 #include <string_view>
+#include <vector>
 
 /// Option values from their text. Failures are `CliError`, without a word about help.
 namespace ZorvaTouch::Tools {
@@ -23,9 +24,11 @@ namespace ZorvaTouch::Tools {
 /// The value of --duration, in seconds: 0.1 to ten hours.
 [[nodiscard]] double parseDuration(std::string_view text);
 
+/// The scenarios' names in their order.
+[[nodiscard]] std::vector<std::string_view> scenarioNameList();
 /// The scenarios' names, "idle, taps, ...".
 [[nodiscard]] std::string scenarioNames();
-/// A scenario's name. The message lists them all.
+/// A scenario's name. The message has the one that was meant, or lists them all.
 [[nodiscard]] const Synth::Scenario &parseScenario(std::string_view option, std::string_view text);
 
 /// A parameter's value as short text, "0.2", "100".
@@ -34,11 +37,12 @@ namespace ZorvaTouch::Tools {
 /// "debug", "default" or "error".
 [[nodiscard]] Ports::LogLevel parseLogLevel(std::string_view text);
 
-/// KEY=VALUE. The key may begin with the domains "Pipeline." and "Algs."; it must be one that can be written.
-/// The value is JSON, or a string if it is none.
+/// KEY=VALUE. The key may begin with the domains "Pipeline." and "Algs."; it must be one that can be written,
+/// and the value within its range. The value is JSON, or a string if it is not JSON.
 [[nodiscard]] Setting parseSetting(std::string_view text);
 
-/// KEY=VALUE for a service: any key as it stands, and a value as above.
+/// KEY=VALUE for a service. A key "Pipeline.Algs.X" and its value are checked as above; any other key is the
+/// device's, and its value is not checked.
 [[nodiscard]] Setting parseProperty(std::string_view text);
 
 } // namespace ZorvaTouch::Tools

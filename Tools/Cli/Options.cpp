@@ -2,11 +2,15 @@
 
 #include "Tools/Cli/CliError.h"
 #include "Tools/Cli/Documents.h"
+#include "Tools/Cli/HelpFormatter.h"
 #include "Tools/Cli/OptionValues.h"
+#include "Tools/Cli/Suggestion.h"
 
 #include <CLI/CLI.hpp>
 
 #include <algorithm>
+#include <memory>
+#include <string_view>
 #include <utility>
 
 namespace ZorvaTouch::Tools {
@@ -21,12 +25,18 @@ Examples:
   zorvatouch replay touch.json
   zorvatouch demo
   zorvatouch make hold.txt - | zorvatouch replay -
-  zorvatouch COMMAND --help
+  zorvatouch help COMMAND
+
+Environment:
+  NO_COLOR        no colours if set to a text that is not empty
+  TERM            neither colours nor a line of electrodes if it is "dumb"
+  XDG_STATE_HOME  demo keeps its recording below (default: ~/.local/state)
 
 Exit status:
-  0  done
-  1  a check failed, or the service refused what it was told
-  2  bad usage, or a file that cannot be read or written
+  0    done
+  1    a check failed, or the service refused a property
+  2    bad usage, or a file that cannot be read or written
+  141  the reader of a pipe has closed it
 )";
 
 constexpr const char *kReplayFooter = R"(
@@ -62,7 +72,11 @@ Examples:
 constexpr const char *kMakeFooter = R"(
 Examples:
   zorvatouch make tap.txt tap.json
-  printf 'touch A=300 for 120ms\nidle for 100ms\n' | zorvatouch make - - | zorvatouch replay -
+  printf 'touch A=300 for 120ms\nidle for 100ms\n' |
+    zorvatouch make - - | zorvatouch replay -
+
+Exit status:
+  1  the text has expected lines, and the replay differs from them
 )";
 
 constexpr const char *kSynthFooter = R"(
@@ -72,11 +86,23 @@ Examples:
   zorvatouch synth --scenario taps --noise 8 -o - | zorvatouch replay -
 )";
 
+constexpr const char *kHelpFooter = R"(
+Examples:
+  zorvatouch help
+  zorvatouch help replay
+)";
+
+constexpr const char *kShortHelpEnd = R"(
+"zorvatouch help" shows more, "zorvatouch help COMMAND" a command's options.
+To begin with, try "zorvatouch demo".
+)";
+
 constexpr const char *kHostFooter = R"(
 Examples:
   zorvatouch host --get Version
   zorvatouch host --device sim:taps --seed 7 --get Pipeline.Algs.DebugInfo
-  zorvatouch host --device recording:touch.json --set Pipeline.Algs.HoldTimeoutMilliseconds=700
+  zorvatouch host --device recording:touch.json \
+    --set Pipeline.Algs.HoldTimeoutMilliseconds=700
   zorvatouch host --device sim:day --speed 1 --save live.json
 )";
 
@@ -92,7 +118,7 @@ class CommandLine {
 public:
     CommandLine() : _app("Runs the touch sensor's service, and replays and inspects recordings.", kProgram) {
         _app.set_version_flag("--version", std::string(kProgram) + " " + ZORVA_VERSION,
-                              "Say the version and exit");
+                              "Show the version and exit");
         describeHelp(_app);
         describeFormat();
         _app.footer(kMainFooter);
@@ -105,9 +131,12 @@ public:
         declareMake();
         declareSynth();
         declareLive();
+        declareHelp();
     }
 
     [[nodiscard]] Options parse(std::span<const std::string> arguments) {
+        if (arguments.empty())
+            return AnswerOptions{shortHelp(), kExitError};
         try {
             _app.parse(libraryArguments(arguments));
         } catch (const CLI::CallForHelp &) {
@@ -132,14 +161,14 @@ private:
     }
 
     void describeFormat() {
-        const auto formatter = _app.get_formatter(); // the commands' too
-        formatter->column_width(24);
+        const auto formatter = std::make_shared<HelpFormatter>(24);
+        _app.formatter(formatter); // the commands' too
         formatter->label("SUBCOMMAND", "COMMAND");
         formatter->label("Positionals", "Arguments");
         formatter->label("REQUIRED", "");
     }
 
-    static void describeHelp(CLI::App &app) { app.set_help_flag("-h,--help", "Say this and exit"); }
+    static void describeHelp(CLI::App &app) { app.set_help_flag("-h,--help", "Show this help and exit"); }
 
     CLI::App &declare(const char *name, const char *description, const char *footer) {
         CLI::App &command = *_app.add_subcommand(name, description);
@@ -160,26 +189,28 @@ private:
 
     void declareReplay() {
         CLI::App &command =
-            declare("replay", "Play recordings and say which gestures come out", kReplayFooter);
+            declare("replay", "Play recordings and show the recognized gestures", kReplayFooter);
         addFiles(command, _replay.files);
-        command.add_option("--speed", _speed, "Pace: 1 is as recorded; no pauses unless given")
+        command.add_option("--speed", _speed, "Speed factor, 1 is as recorded (default: inf, no pauses)")
             ->type_name("X");
-        command.add_option("--set", _settings, "Begin with a state, as --set ActivationThreshold=250")
+        command
+            .add_option("--set", _settings,
+                        "Begin with a state, as --set ActivationThreshold=250 (may be repeated)")
             ->type_name("KEY=VALUE")
             ->allow_extra_args(false);
         command.add_flag("--describe", _replay.describe,
                          "Add the recognizer's view of each frame with a gesture");
         command.add_flag("--json", _replay.json, "Write a line of JSON for each report");
-        command.add_option("--expect", _replay.expectFile, "Compare with what --json has written before")
+        command.add_option("--expect", _replay.expectFile, "Compare with a file that --json has written")
             ->type_name("FILE");
         command
             .add_option("--log-level", _logLevel,
-                        "Log to standard error: debug, default or error (as if not given)")
+                        "Log to standard error: debug, default or error (default: error)")
             ->type_name("LEVEL");
     }
 
     void declareInfo() {
-        CLI::App &command = declare("info", "Say what recordings hold", kInfoFooter);
+        CLI::App &command = declare("info", "Summarize recordings", kInfoFooter);
         addFiles(command, _info.files);
         command.add_flag("--json", _info.json, "Write a line of JSON for each recording");
     }
@@ -187,7 +218,7 @@ private:
     void declareShow() {
         CLI::App &command = declare("show", "Draw an image of the sensor", kShowFooter);
         command.add_option("FILE", _show.file, "Recording")->required()->type_name("");
-        command.add_option("--frame", _frame, "Index in the recording; the strongest image unless given")
+        command.add_option("--frame", _frame, "Index in the recording (default: the strongest image)")
             ->type_name("N");
         command.add_flag("--raw", _show.raw, "Draw the raw counts instead of the signals");
     }
@@ -199,7 +230,8 @@ private:
     }
 
     void declareTrim() {
-        CLI::App &command = declare("trim", "Keep the newest frames and the states they need", kTrimFooter);
+        CLI::App &command =
+            declare("trim", "Keep the newest frames and the states that they need", kTrimFooter);
         addInAndOut(command, _trim.in, _trim.out, "Recording to read");
         command.add_option("--max", _max, "Frames to keep, state writes not counted")
             ->required()
@@ -207,7 +239,7 @@ private:
     }
 
     void declareMake() {
-        CLI::App &command = declare("make", "Make a recording from its text form", kMakeFooter);
+        CLI::App &command = declare("make", "Make a recording from its text form, and check it", kMakeFooter);
         addInAndOut(command, _make.in, _make.out, "Text to read");
     }
 
@@ -217,8 +249,14 @@ private:
 
     void declareLive() {
         _host.declare(
-            declare("host", "Load the service as a host does, and play, ask and tell", kHostFooter));
+            declare("host", "Load the service as a host does; get and set properties", kHostFooter));
         _demo.declare(declare("demo", "Watch the live service with a simulated finger", kDemoFooter));
+    }
+
+    void declareHelp() {
+        declare("help", "Show the help of the program or of a command", kHelpFooter)
+            .add_option("COMMAND", _helpCommand, "Command (default: the program)")
+            ->type_name("");
     }
 
     /// The command that was named, or the program if none was.
@@ -227,8 +265,38 @@ private:
         return chosen.empty() ? _app : *chosen.front();
     }
 
-    [[nodiscard]] std::string helpText() {
-        return &chosenApp() == &_app ? _app.help() : chosenApp().help(kProgram);
+    [[nodiscard]] std::string helpText() { return helpOf(chosenApp()); }
+
+    /// The library's own `help` of the program gives the chosen command's.
+    [[nodiscard]] std::string helpOf(const CLI::App &app) const {
+        if (&app != &_app)
+            return app.help(kProgram);
+        return _app.get_formatter()->make_help(&_app, kProgram, CLI::AppFormatMode::Normal);
+    }
+
+    [[nodiscard]] std::string shortHelp() {
+        _app.footer(kShortHelpEnd);
+        return _app.help();
+    }
+
+    [[nodiscard]] std::vector<std::string_view> commandNames() const {
+        std::vector<std::string_view> names;
+        for (const CLI::App *const command : _app.get_subcommands(nullptr))
+            names.push_back(command->get_name());
+        return names;
+    }
+
+    [[nodiscard]] std::string unknownCommand(const std::string &name) const {
+        return "'" + name + "' is not a command" + suggestion(name, commandNames());
+    }
+
+    [[nodiscard]] AnswerOptions readHelp() const {
+        if (!_helpCommand)
+            return {helpOf(_app)};
+        for (const CLI::App *const command : _app.get_subcommands(nullptr))
+            if (command->get_name() == *_helpCommand)
+                return {helpOf(*command)};
+        throw CliError(unknownCommand(*_helpCommand));
     }
 
     [[nodiscard]] std::string hint() {
@@ -241,9 +309,15 @@ private:
 
     /// What the library found wrong, in one line.
     [[nodiscard]] std::string parseProblem(const CLI::ParseError &error) {
-        const auto extras = _app.remaining();
-        if (&chosenApp() == &_app && !extras.empty() && !extras.front().starts_with('-'))
-            return "'" + extras.front() + "' is no command";
+        const CLI::App &app = chosenApp();
+        const auto extras = app.remaining();
+        const auto option = std::find_if(extras.begin(), extras.end(),
+                                         [](const std::string &extra) { return extra.starts_with('-'); });
+        if (option != extras.end())
+            return unknownOption(*option, app);
+        if (!extras.empty())
+            return &app == &_app ? unknownCommand(extras.front())
+                                 : "unexpected argument '" + extras.front() + "'";
         std::string text = error.what();
         std::replace(text.begin(), text.end(), '\n', ' ');
         return text;
@@ -276,7 +350,9 @@ private:
             return _host.read();
         if (command == "demo")
             return _demo.read();
-        throw CliError("a command is missing");
+        if (command == "help")
+            return readHelp();
+        throw CliError("a command is required");
     }
 
     static void requireOneStandardInput(std::vector<std::string> inputs) {
@@ -328,7 +404,7 @@ private:
     HostArguments _host;
     DemoArguments _demo;
     // As typed.
-    std::optional<std::string> _speed, _logLevel, _frame;
+    std::optional<std::string> _speed, _logLevel, _frame, _helpCommand;
     std::vector<std::string> _settings;
     std::string _max;
 };

@@ -2,6 +2,7 @@
 
 #include "Shared/Ports/Log.h"
 #include "Shared/Util/PropertyValue.h"
+#include "Tools/Cli/ExitStatus.h"
 #include "Tools/Cli/LiveOptions.h"
 #include "Tools/Cli/SynthOptions.h"
 
@@ -50,9 +51,10 @@ struct MakeOptions {
     std::string in, out;
 };
 
-/// Text that was asked for: help, version.
+/// Text that was asked for: help, version. Or the short help, if nothing was asked for.
 struct AnswerOptions {
     std::string text;
+    ExitStatus status = kExitDone; ///< text goes to standard error unless this is `kExitDone`
 };
 
 using Options = std::variant<ReplayOptions, InfoOptions, ShowOptions, ConvertOptions, TrimOptions,

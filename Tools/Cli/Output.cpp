@@ -3,6 +3,7 @@
 #include "Host/Runtime/Files.h"
 #include "Tools/Cli/CliError.h"
 
+#include <cerrno>
 #include <utility>
 
 namespace ZorvaTouch::Tools {
@@ -34,6 +35,8 @@ void Output::flush() {
         _text.clear(); // keeps the capacity
     } catch (const Host::FileFailure &failure) {
         _text.clear();
+        if (failure.code().value() == EPIPE)
+            throw ClosedPipe();
         throw fileError(_name, failure);
     }
 }

@@ -31,7 +31,8 @@ public:
     void wrote();
 
     /// Passes on what there is.
-    /// @throws CliError  "standard output: cannot write: ..."; the text is gone then.
+    /// @throws CliError    "standard output: cannot write: ..."; the text is gone then.
+    /// @throws ClosedPipe
     void flush();
 
     std::function<void()> beforeFlush; ///< called before text is passed on, when set

@@ -2,6 +2,7 @@
 
 #include "Tools/Cli/CliError.h"
 #include "Tools/Cli/OptionValues.h"
+#include "Tools/Cli/Suggestion.h"
 
 #include <CLI/CLI.hpp>
 
@@ -15,29 +16,32 @@ constexpr const char *kDefaultScenario = "day";
 std::string flagOf(const Synth::ParameterInfo &info) { return "--" + std::string(info.name); }
 
 std::string helpOf(const Synth::ParameterInfo &info) {
-    return std::string(info.meaning) + " (" + numberText(info.standard) + ")";
+    return std::string(info.meaning) + " (default: " + numberText(info.standard) + ")";
 }
 
 const Synth::Scenario &scenarioOrHint(std::string_view name) {
     if (const Synth::Scenario *scenario = Synth::scenarioNamed(name))
         return *scenario;
-    throw CliError("--scenario: '" + std::string(name) + "' is no scenario; --list shows them");
+    throw CliError("--scenario: '" + std::string(name) + "' is not a scenario" +
+                   suggestion(name, scenarioNameList(), "; --list shows them"));
 }
 
 } // namespace
 
 void SynthArguments::declare(CLI::App &command) {
-    command.add_option("--scenario", _scenario, "What happens; day unless given")->type_name("NAME");
-    command.add_option("--seed", _seed, "The same gives the same recording; 1 unless given")->type_name("N");
-    command.add_option("--duration", _duration, "Length in seconds; the scenario's unless given")
+    command.add_option("--scenario", _scenario, "What happens (default: day)")->type_name("NAME");
+    command.add_option("--seed", _seed, "The same seed gives the same recording (default: 1)")
+        ->type_name("N");
+    command.add_option("--duration", _duration, "Length in seconds (default: the scenario's)")
         ->type_name("S");
-    command.add_option("-o", _out, "Recording to write")->type_name("FILE");
-    command.add_flag("--list", _list, "List the scenarios instead");
+    command.add_option("-o,--output", _out, "Recording to write (required, unless --list is given)")
+        ->type_name("FILE");
+    command.add_flag("--list", _list, "List the scenarios and exit");
     for (std::size_t i = 0; i < Synth::kParameterCount; ++i) {
         const Synth::ParameterInfo &info = Synth::parameters()[i];
         command.add_option(flagOf(info), _parameters[i], helpOf(info))
             ->type_name(std::string(info.unit))
-            ->group("Parameters, with their units and defaults");
+            ->group("Parameters, with their units");
     }
 }
 
@@ -56,7 +60,7 @@ SynthOptions SynthArguments::read() const {
         options.seed = parseCount("--seed", *_seed, 0);
     options.duration = _duration ? parseDuration(*_duration) : options.scenario->duration;
     if (!_out && !_list)
-        throw CliError("-o is required");
+        throw CliError("--output is required");
     options.out = _out.value_or("");
     return options;
 }

@@ -2,6 +2,7 @@
 
 #include "Shared/Util/Text.h"
 #include "Tools/Cli/CliError.h"
+#include "Tools/Cli/HelpFormatter.h"
 #include "Tools/Cli/OptionValues.h"
 
 #include <CLI/CLI.hpp>
@@ -9,6 +10,7 @@
 #include <algorithm>
 #include <charconv>
 #include <cstdint>
+#include <memory>
 #include <string_view>
 #include <utility>
 
@@ -21,8 +23,8 @@ constexpr std::size_t kMostRecordings = 1000; ///< each name is checked at the s
 constexpr std::string_view kFingerPrefix = "sim:";
 
 constexpr const char *kDescription =
-    "Turns touches of the touch surface into media keys: taps play, pause and change the volume, holds\n"
-    "repeat. Runs until it is told to end, and takes surfaces as they come and go.\n";
+    "Turns touches of the touch surface into media keys: taps play, pause and\n"
+    "change the volume, holds repeat. Runs until a signal; supports hot-plug.\n";
 
 constexpr const char *kFooter = R"(
 Examples:
@@ -39,14 +41,15 @@ Signals:
   SIGUSR1                  save the recording now, and go on
 
 Exit status:
-  0  ended by a signal, or with the simulated finger
-  1  the plug-in cannot be loaded, nothing can work, or a recording was lost
-  2  bad usage
-  3  another program uses a surface, as a second zorvatouchd does; see --wait
+  0    ended by a signal, or with the simulated finger
+  1    the plug-in cannot be loaded, nothing can work, or a recording was lost
+  2    bad usage
+  3    another program uses a surface, as a second zorvatouchd does; see --wait
+  141  the reader of a pipe has closed it (--help, --version, --describe)
 )";
 
 [[noreturn]] void refuse(std::string_view option, std::string_view text, const std::string &problem) {
-    throw CliError(std::string(option) + ": '" + std::string(text) + "' is " + problem);
+    throw CliError(std::string(option) + ": '" + std::string(text) + "'" + problem);
 }
 
 /// One to four hexadecimal digits.
@@ -67,7 +70,7 @@ Linux::HidId parseId(std::string_view text) {
         if (vendor && product)
             return {*vendor, *product};
     }
-    refuse("--id", text, "not VENDOR:PRODUCT in hexadecimal digits, at most four each, as 1234:ABCD");
+    refuse("--id", text, " must be VENDOR:PRODUCT in hexadecimal digits, at most four each, as 1234:ABCD");
 }
 
 AccelOption parseAccel(const std::string &text) {
@@ -76,25 +79,25 @@ AccelOption parseAccel(const std::string &text) {
     if (text == "none")
         return {AccelOption::Choice::None, {}};
     if (text.empty())
-        refuse("--accel", text, "none of auto, none and an accelerometer's name");
+        refuse("--accel", text, " must be auto, none or the name of an accelerometer");
     return {AccelOption::Choice::Named, text};
 }
 
 void requireFileName(std::string_view option, const std::string &name) {
     if (name.empty() || name == "-" || name.ends_with('/'))
-        refuse(option, name, "no file's name");
+        refuse(option, name, " is not the name of a file");
 }
 
 template <typename Value>
 void requireOnce(std::string_view option, const std::vector<Value> &values, const Value &value,
                  const std::string &text) {
     if (std::find(values.begin(), values.end(), value) != values.end())
-        refuse(option, text, "given twice");
+        refuse(option, text, " is given twice");
 }
 
 /// The scenarios' names in lines, each but the first after `indent`.
 std::string brokenScenarioNames(std::string_view indent) {
-    constexpr std::size_t kLongestLine = 52;
+    constexpr std::size_t kLongestLine = 40;
     std::string text;
     std::size_t length = 0;
     for (const Synth::Scenario &scenario : Synth::scenarios()) {
@@ -113,7 +116,7 @@ std::string brokenScenarioNames(std::string_view indent) {
 class DaemonCommandLine {
 public:
     DaemonCommandLine() : _app(kDescription, kProgram) {
-        _app.get_formatter()->column_width(32);
+        _app.formatter(std::make_shared<HelpFormatter>(24));
         _app.footer(kFooter);
         _app.set_help_flag(); // to be declared again, so that its group comes last
         declareDevices();
@@ -142,7 +145,8 @@ private:
     [[nodiscard]] std::string parseProblem(const CLI::ParseError &error) const {
         const std::vector<std::string> extras = _app.remaining();
         if (!extras.empty())
-            return "'" + extras.front() + "' is no option";
+            return extras.front().starts_with('-') ? unknownOption(extras.front(), _app)
+                                                   : "unexpected argument '" + extras.front() + "'";
         const std::vector<const CLI::Option *> repeated = _app.get_options(
             [](const CLI::Option *option) { return option->get_expected_max() <= 1 && option->count() > 1; });
         if (!repeated.empty())
@@ -169,33 +173,31 @@ private:
     void declareDevices() {
         constexpr const char *kGroup = "Surfaces";
         addOptions(kGroup, "--device", _devices, "DEVICE",
-                   "Use this one, and look for no other. May be repeated\n"
+                   "Use this one, and look for no other (may be repeated)\n"
                    "/dev/hidraw0  the path of a surface's node\n"
                    "sim:SCENARIO  a simulated finger, which needs no hardware:\n"
                    "              " +
                        brokenScenarioNames("              "));
-        addOption(kGroup, "--seed", _seed, "N",
-                  "Of sim: the same number gives the same finger; 1 unless given");
+        addOption(kGroup, "--seed", _seed, "N", "Of sim: the same seed gives the same finger (default: 1)");
         addOption(kGroup, "--duration", _duration, "S",
-                  "Of sim: end after so many seconds; without an end unless given");
+                  "Of sim: end after this many seconds (default: no end)");
         addOptions(kGroup, "--id", _ids, "VENDOR:PRODUCT",
-                   "Look for this make, in hexadecimal digits. May be repeated\n"
-                   "Those that are given take the place of 1234:ABCD");
+                   "Look for this make, in hexadecimal digits (may be repeated; default: 1234:ABCD)");
         addFlag(kGroup, "--wait", _wait, "Wait for surfaces that another daemon uses");
         addOption(kGroup, "--accel", _accel, "NAME",
-                  "Which accelerometer to use; auto unless given\n"
-                  "auto          any that is there\n"
-                  "none          none\n"
+                  "Which accelerometer to use (default: auto)\n"
+                  "auto          any that is present\n"
+                  "none          do without one\n"
                   "NAME          the one of that name, label or node");
     }
 
     void declareKeys() {
         constexpr const char *kGroup = "Keys";
         addOptions(kGroup, "--map", _maps, "MAPPING",
-                   "Press another key: GESTURE:REGION=KEY. May be repeated\n"
+                   "Press another key: GESTURE:REGION=KEY (may be repeated)\n"
                    "GESTURE       tap, hold\n"
                    "REGION        play-pause, volume-down, volume-up\n"
-                   "KEY           the kernel's name of it, as KEY_NEXTSONG; or none");
+                   "KEY           the kernel's name, as KEY_NEXTSONG; or none");
         declareKeyLimit(kGroup);
         addFlag(kGroup, "--no-keys", _noKeys, "Show the keys instead of pressing them");
         addFlag(kGroup, "--keys", _keys, "Press the keys of simulated surfaces, too (default: show them)");
@@ -211,7 +213,7 @@ private:
     void declareOutput() {
         constexpr const char *kGroup = "Output";
         addOption(kGroup, "--events", _events, "FORMAT",
-                  "Write what happens to standard output\n"
+                  "Write events to standard output (default: for people)\n"
                   "json          a line of JSON for each event");
         addOption(kGroup, "--save", _save, "FILE",
                   "Write the recording at the end and at SIGUSR1, for its owner only\n"
@@ -224,17 +226,17 @@ private:
                   "oldest are removed first (default: 67108864)");
         addFlag(kGroup, "--save-serial", _savesSerial, "Write serial numbers into recordings");
         addOption(kGroup, "--log-level", _logLevel, "LEVEL",
-                  "Log from this level on: error, default (unless given), debug");
-        addFlag(kGroup, "--describe", _describe, "Say as JSON what is there, and exit");
+                  "Log from this level on: error, default or debug (default: default)");
+        addFlag(kGroup, "--describe", _describe, "Show the devices and settings as JSON and exit");
     }
 
     void declareOther() {
         constexpr const char *kGroup = "Other";
         addOption(kGroup, "--plugin", _plugIn, "PATH",
-                  "The plug-in's file; the one that came with the program unless given");
-        _app.set_help_flag("-h,--help", "Say this and exit")->group(kGroup);
+                  "The plug-in's file (default: the one installed with the program)");
+        _app.set_help_flag("-h,--help", "Show this help and exit")->group(kGroup);
         _app.set_version_flag("--version", std::string(kProgram) + " " + ZORVA_VERSION,
-                              "Say the version and exit")
+                              "Show the version and exit")
             ->group(kGroup);
     }
 
@@ -274,7 +276,7 @@ private:
     [[nodiscard]] static std::string readNode(const std::string &path) {
         if (path.find('/') == std::string::npos)
             refuse("--device", path,
-                   "neither a path, as /dev/hidraw0, nor sim:SCENARIO; scenarios are " + scenarioNames());
+                   " must be a path, as /dev/hidraw0, or sim:SCENARIO; scenarios are " + scenarioNames());
         return path;
     }
 
@@ -331,7 +333,7 @@ private:
 
     void readOutput(DaemonOptions &options) const {
         if (_events && *_events != "json")
-            refuse("--events", *_events, "no format; there is json");
+            refuse("--events", *_events, " is not a format; json is");
         options.showsEvents = _events.has_value();
         options.waits = _wait;
         options.describe = _describe;

@@ -1,6 +1,7 @@
 #include "Tools/Daemon/KeyMap.h"
 
 #include "Shared/Util/Text.h"
+#include "Tools/Cli/Suggestion.h"
 #include "Tools/Stimulus/LineWords.h"
 
 #include <algorithm>
@@ -77,24 +78,26 @@ template <typename Names> std::string listOf(const Names &names) {
 }
 
 /// Where a name is, from `first` on.
-/// @throws KeyMapError  "'swipe' is no gesture; there are tap, hold"
+/// @throws KeyMapError  "'swipe' is not a gesture; gestures are tap, hold"
 template <std::size_t N>
 std::size_t indexNamed(const std::array<std::string_view, N> &names, std::size_t first, std::string_view name,
                        const char *what) {
     const std::span known = std::span(names).subspan(first);
     const auto found = std::find(known.begin(), known.end(), name);
     if (found == known.end())
-        throw KeyMapError(shown(name) + " is no " + what + "; there are " + listOf(known));
+        throw KeyMapError(shown(name) + " is not a " + what +
+                          suggestion(name, known, std::string("; ") + what + "s are " + listOf(known)));
     return first + static_cast<std::size_t>(found - known.begin());
 }
 
 KeyCode requireKey(std::string_view name) {
     if (const auto code = keyNamed(name))
         return *code;
-    std::string message = shown(name) + " is no key; there are " + std::string(kNoKeyName);
+    std::vector<std::string_view> names{kNoKeyName};
     for (const NamedKey &key : kNamedKeys)
-        message.append(", ").append(key.name);
-    throw KeyMapError(message);
+        names.push_back(key.name);
+    throw KeyMapError(shown(name) + " is not a key that can be pressed" +
+                      suggestion(name, names, "; Docs/Keys.md lists the keys"));
 }
 
 } // namespace

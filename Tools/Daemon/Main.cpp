@@ -16,6 +16,7 @@
 #include "Tools/Hosting/ProgramFolder.h"
 #include "Tools/Hosting/ScreenLogs.h"
 
+#include <cerrno>
 #include <cstdlib>
 #include <exception>
 #include <memory>
@@ -30,7 +31,13 @@ namespace {
 
 using namespace ZorvaTouch;
 
-enum ExitStatus { kExitEnded = 0, kExitFailed = 1, kExitWrongUsage = 2, kExitInUse = 3 };
+enum ExitStatus {
+    kExitEnded = 0,
+    kExitFailed = 1,
+    kExitWrongUsage = 2,
+    kExitInUse = 3,
+    kExitClosedPipe = 141
+};
 
 std::unique_ptr<Ports::LogProvider> openLogs(Ports::LogLevel level) {
     if (Linux::isJournalStream(static_cast<int>(Host::StandardStream::Error)))
@@ -121,6 +128,8 @@ int main(int argc, char **argv) {
         return options.describe ? describe(options) : runDaemon(options);
     } catch (const Tools::CliError &error) {
         return fail(error, kExitWrongUsage);
+    } catch (const Host::FileFailure &failure) {
+        return failure.code().value() == EPIPE ? kExitClosedPipe : fail(failure, kExitFailed);
     } catch (const Tools::SurfaceInUse &error) {
         return fail(error, kExitInUse);
     } catch (const std::bad_alloc &) {

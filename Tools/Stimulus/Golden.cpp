@@ -84,9 +84,13 @@ std::vector<std::string> replayLines(const FrameList &frames, std::span<const Ex
     return lines;
 }
 
+std::string compareExpected(const FrameList &frames, std::span<const ExpectedLine> expected) {
+    return differenceOf(textsOf(expected), replayLines(frames, expected));
+}
+
 std::string compareGolden(std::string_view text) try {
     const Stimulus stimulus = parseStimulus(text);
-    return differenceOf(textsOf(stimulus.expected), replayLines(stimulus.frames, stimulus.expected));
+    return compareExpected(stimulus.frames, stimulus.expected);
 } catch (const StimulusError &error) {
     return error.what();
 }

@@ -17,6 +17,10 @@ namespace ZorvaTouch::Tools {
 [[nodiscard]] std::vector<std::string> replayLines(const FrameList &frames,
                                                    std::span<const ExpectedLine> expected);
 
+/// Replays a stimulus in virtual time and compares with its expected lines.
+/// @return As `compareGolden` below.
+[[nodiscard]] std::string compareExpected(const FrameList &frames, std::span<const ExpectedLine> expected);
+
 /// Replays a text's stimulus in virtual time and compares with its expected lines.
 ///
 /// @return Empty when all is as expected. Otherwise what differs, to show to a person: the lines that both

@@ -12,6 +12,20 @@ say() {
     printf '%s\n' "$*" >&2
 }
 
+# header FILE: its comment, without the first line and the marks.
+header() {
+    awk 'NR > 1 && !/^#/ { exit } NR > 1 { sub(/^# ?/, ""); print }' "$1"
+}
+
+# answer_help ARGUMENT...: shows the script's own comment and ends if the first argument asks for help. Called before
+# anything is installed or built.
+answer_help() {
+    if [[ ${1-} == -h || ${1-} == --help ]]; then
+        header "$0"
+        exit 0
+    fi
+}
+
 # packages_of GROUP...: the packages listed under these groups, one a line.
 packages_of() {
     awk -v groups=" $* " '

@@ -30,7 +30,7 @@ TEST_F(SynthCommand, HelpHasAFlagUnitAndDefaultForEachParameter) {
     const std::string help = outputOf({"synth", "--help"});
     for (const Synth::ParameterInfo &info : Synth::parameters())
         EXPECT_THAT(help, HasSubstr("--" + std::string(info.name) + " " + std::string(info.unit)));
-    EXPECT_THAT(help, HasSubstr("Of each electrode in each image, sd (3)\n"));
+    EXPECT_THAT(help, HasSubstr("Of each electrode in each image, sd (default: 3)\n"));
     EXPECT_THAT(help, HasSubstr("\n  zorvatouch synth "));
 }
 
@@ -70,17 +70,19 @@ TEST_F(SynthCommand, ParametersOverrideTheScenariosOwn) {
 
 TEST_F(SynthCommand, BadUsageIsOneLine) {
     const std::string hint = " (see zorvatouch synth --help)\n";
-    EXPECT_EQ(errorOf({"synth"}), "zorvatouch: -o is required" + hint);
+    EXPECT_EQ(errorOf({"synth"}), "zorvatouch: --output is required" + hint);
     EXPECT_EQ(errorOf({"synth", "--scenario", "tap", "-o", "-"}),
-              "zorvatouch: --scenario: 'tap' is no scenario; --list shows them" + hint);
+              "zorvatouch: --scenario: 'tap' is not a scenario; did you mean 'taps'?" + hint);
+    EXPECT_EQ(errorOf({"synth", "--scenario", "night", "-o", "-"}),
+              "zorvatouch: --scenario: 'night' is not a scenario; --list shows them" + hint);
     EXPECT_EQ(errorOf({"synth", "--noise", "-1", "-o", "-"}),
-              "zorvatouch: --noise: '-1' is no number from 0 to 10000 (counts)" + hint);
+              "zorvatouch: --noise: '-1' must be a number from 0 to 10000 (counts)" + hint);
     EXPECT_EQ(errorOf({"synth", "--finger-width", "nan", "-o", "-"}),
-              "zorvatouch: --finger-width: 'nan' is no number from 0.5 to 100 (mm)" + hint);
+              "zorvatouch: --finger-width: 'nan' must be a number from 0.5 to 100 (mm)" + hint);
     EXPECT_EQ(errorOf({"synth", "--duration", "1h", "-o", "-"}),
-              "zorvatouch: --duration: '1h' is no number from 0.1 to 36000 (s)" + hint);
+              "zorvatouch: --duration: '1h' must be a number from 0.1 to 36000 (s)" + hint);
     EXPECT_EQ(errorOf({"synth", "--seed", "1.5", "-o", "-"}),
-              "zorvatouch: --seed: '1.5' is no whole number from 0 on" + hint);
+              "zorvatouch: --seed: '1.5' must be an integer >= 0" + hint);
     EXPECT_THAT(errorOf({"synth", "--loudness", "3", "-o", "-"}),
                 AllOf(HasSubstr("--loudness"), EndsWith(hint)));
 }

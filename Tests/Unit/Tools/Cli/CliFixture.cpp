@@ -37,6 +37,8 @@ std::string replaceAll(std::string text, const std::string &what, const std::str
 void StringSink::write(std::string_view written) {
     if (isFull)
         throw Host::FileFailure("write", ENOSPC);
+    if (isClosed)
+        throw Host::FileFailure("write", EPIPE);
     text.append(written);
     if (onWrite)
         onWrite(text);
@@ -70,6 +72,7 @@ CliFixture::Run CliFixture::run(std::initializer_list<std::string> arguments) {
         .usesColour = usesColour,
         .showsProgress = showsProgress,
         .screenColumns = [this] { return screenColumns; },
+        .screenRows = [this] { return screenRows; },
         .watchStop =
             [this](std::function<void()> onStop) {
                 stop = std::move(onStop);

@@ -18,11 +18,12 @@ namespace ZorvaTouch::Tools {
 /// Collects what is written to it, or refuses it.
 class StringSink final : public TextSink {
 public:
-    /// @throws Host::FileFailure  ENOSPC, once `isFull` is set.
+    /// @throws Host::FileFailure  ENOSPC once `isFull` is set, EPIPE once `isClosed` is.
     void write(std::string_view written) override;
 
     std::string text;
     bool isFull = false;
+    bool isClosed = false;                                ///< the reader of a pipe has closed it
     std::function<void(const std::string &text)> onWrite; ///< told of all the text so far, when set
 };
 
@@ -64,6 +65,7 @@ protected:
     bool usesColour = false;
     bool showsProgress = false;
     std::size_t screenColumns = 0;
+    std::size_t screenRows = 0;
     std::function<void()> stop; ///< what a run that can be stopped is stopped with, while it goes on
 
 private:

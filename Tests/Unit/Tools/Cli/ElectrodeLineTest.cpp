@@ -4,6 +4,9 @@
 
 #include <gmock/gmock.h>
 
+#include <algorithm>
+#include <string_view>
+
 namespace ZorvaTouch::Tools {
 namespace {
 
@@ -73,6 +76,46 @@ TEST(ElectrodeLine, TheTouchedRegionHasItsColour) {
     EXPECT_THAT(line, HasSubstr("\x1b[36mI█\x1b[0m"));
     EXPECT_THAT(line, HasSubstr("\x1b[2mK \x1b[0m"));
     EXPECT_THAT(line, EndsWith("\x1b[36mvolume up\x1b[0m"));
+}
+
+TEST(ElectrodePicture, ShowsEachElectrodeAtItsPlaceBesideALegend) {
+    EXPECT_EQ(electrodePicture(imageOf(404, 100), kTimeNs, 79, false),
+              "           H▁▁▁      G              \n"
+              "                I███                     3.20 s  \n"
+              "     B                     A          volume up\n"
+              "         J             J            \n"
+              "     F                     E        \n"
+              " A                             B      A to O  electrodes at their places\n"
+              "                K                     ▁ to █  weak to firm touch\n"
+              " D                             C      colour  the touched region:\n"
+              "     E                     F          play/pause  volume down  volume up\n"
+              "         L             L            \n"
+              "     C                     D        \n"
+              "                M                   \n"
+              "           N         O              ");
+}
+
+TEST(ElectrodePicture, NarrowScreensGetNoLegendAndThenNothing) {
+    const auto columnsOf = [](std::size_t columns) {
+        const std::string picture = electrodePicture(imageOf(404, 100), kTimeNs, columns, false);
+        std::size_t widest = 0;
+        for (std::size_t at = 0; at < picture.size();) {
+            const std::size_t end = std::min(picture.find('\n', at), picture.size());
+            widest = std::max(widest, widthOf(std::string_view(picture).substr(at, end - at)));
+            at = end + 1;
+        }
+        return widest;
+    };
+    EXPECT_EQ(columnsOf(76), 72u);
+    EXPECT_EQ(columnsOf(75), 36u);
+    EXPECT_EQ(columnsOf(36), 36u);
+    EXPECT_EQ(columnsOf(35), 0u);
+}
+
+TEST(ElectrodePicture, TheTouchedRegionHasItsColour) {
+    const std::string picture = electrodePicture(imageOf(404, 0), 0, 79, true);
+    EXPECT_THAT(picture, HasSubstr("\x1b[36mI███\x1b[0m"));
+    EXPECT_THAT(picture, HasSubstr("\x1b[2mK   \x1b[0m"));
 }
 
 } // namespace

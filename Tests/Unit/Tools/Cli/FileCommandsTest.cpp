@@ -57,12 +57,29 @@ TEST_F(FileCommands, TrimGoesToStandardOutput) {
 }
 
 TEST_F(FileCommands, MakeWritesARecording) {
-    writeFile("text.txt", "meta Place bench\nwait 1ms\nraw 0a # any\n\nreset\n");
+    writeFile("text.txt", "meta Place bench\nwait 1ms\nraw 0a # any\n");
     EXPECT_EQ(outputOf({"make", "@text.txt", "@made.json"}), "");
     EXPECT_EQ(
         readFile("made.json"),
         R"({"Version":2,"Frames":[{"Type":"Metadata","Timestamp":1000000000,"Key":"Place","Value":"bench"},)"
         R"({"Type":"InputReport","Timestamp":1001000000,"Data":"0a "}]})");
+}
+
+TEST_F(FileCommands, MakeReportsWhatIsNotAsExpected) {
+    writeFile("good.txt", "touch A=300 for 120ms\nidle for 50ms\n\n"
+                          "frame 1 @0ms may-begin play/pause\nframe 13 @120ms tap play/pause\n");
+    EXPECT_EQ(outputOf({"make", "@good.txt", "@made.json"}), "");
+    writeFile("bad.txt", "touch A=300 for 120ms\nidle for 50ms\n\n"
+                         "frame 1 @0ms may-begin play/pause\nframe 13 @120ms tap volume-up\n");
+    const Run result = run({"make", "@bad.txt", "@bad.json"});
+    EXPECT_EQ(result.status, 1);
+    EXPECT_EQ(result.output, "");
+    EXPECT_EQ(result.error, "zorvatouch: " + path("bad.txt") +
+                                ": the replay differs from the expected lines (- expected, + replayed)\n"
+                                "  frame 1 @0ms may-begin play/pause\n"
+                                "- frame 13 @120ms tap volume-up\n"
+                                "+ frame 13 @120ms tap play/pause\n");
+    EXPECT_EQ(readFile("bad.json"), readFile("made.json")) << "the recording is written all the same";
 }
 
 TEST_F(FileCommands, MakeGoesFromStandardInputToStandardOutput) {

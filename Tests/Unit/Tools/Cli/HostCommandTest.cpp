@@ -21,25 +21,45 @@ constexpr const char *kTapAndHold = "touch A=300 for 50ms\n"
                                     "touch I=260 J=220 for 600ms\n"
                                     "idle for 50ms\n";
 
-/// Output without its first line, which names the plug-in's file.
-std::string withoutHeading(const std::string &output) { return output.substr(output.find('\n') + 1); }
+/// Output without its first two lines, which name the service and the device.
+std::string withoutHeading(const std::string &output) {
+    return output.substr(output.find('\n', output.find('\n') + 1) + 1);
+}
 
 TEST_F(HostCommand, AsksForPropertiesWithoutADevice) {
-    EXPECT_EQ(outputOf({"host", "--get", "Version", "--get", "Pipeline.DebugInfo", "--get", "Colour"}),
+    EXPECT_EQ(outputOf({"host", "--get", "Version", "--get", "Pipeline.DebugInfo"}),
               "Version: [26,0,0]\n"
               "Pipeline.DebugInfo: {\n"
               "  \"DisjointImageCount\": 0,\n"
               "  \"ResetCount\": 0\n"
-              "}\n"
-              "Colour: no such property\n");
+              "}\n");
 }
 
 TEST_F(HostCommand, AsksForPropertiesInLinesOfJson) {
     EXPECT_EQ(
-        outputOf({"host", "--json", "--get", "Version", "--get", "Pipeline.DebugInfo", "--get", "Colour"}),
+        outputOf({"host", "--json", "--get", "Version", "--get", "Pipeline.DebugInfo"}),
         "{\"property\":\"Version\",\"value\":[26,0,0]}\n"
-        "{\"property\":\"Pipeline.DebugInfo\",\"value\":{\"DisjointImageCount\":0,\"ResetCount\":0}}\n"
-        "{\"property\":\"Colour\",\"value\":null}\n");
+        "{\"property\":\"Pipeline.DebugInfo\",\"value\":{\"DisjointImageCount\":0,\"ResetCount\":0}}\n");
+}
+
+TEST_F(HostCommand, AnUnknownPropertyIsAnErrorAfterWhichTheOthersAreRead) {
+    const Run result = run({"host", "--get", "Colour", "--get", "Version"});
+    EXPECT_EQ(result.status, 1);
+    EXPECT_EQ(result.output, "Version: [26,0,0]\n");
+    EXPECT_EQ(result.error, "zorvatouch: --get: the service does not have a property \"Colour\"\n");
+    const Run json = run({"host", "--json", "--get", "Colour"});
+    EXPECT_EQ(json.status, 1);
+    EXPECT_EQ(json.output, "{\"property\":\"Colour\",\"value\":null}\n");
+    EXPECT_EQ(json.error, result.error);
+}
+
+TEST_F(HostCommand, AStateKeyIsCheckedBeforeAnythingStarts) {
+    EXPECT_THAT(errorOf({"host", "--set", "Pipeline.Algs.Nonsense=3"}),
+                StartsWith("zorvatouch: --set: 'Pipeline.Algs.Nonsense' is not a writable state key; "));
+    EXPECT_THAT(
+        errorOf({"host", "--set", "HoldTimeoutMilliseconds=3"}),
+        StartsWith("zorvatouch: --set: 'HoldTimeoutMilliseconds' is a state key; with its domains it is "
+                   "Pipeline.Algs.HoldTimeoutMilliseconds "));
 }
 
 TEST_F(HostCommand, AsksTheDeviceForWhatTheServiceDoesNotKnow) {
@@ -64,17 +84,15 @@ TEST_F(HostCommand, AsksTheDeviceForWhatTheServiceDoesNotKnow) {
 TEST_F(HostCommand, PlaysARecordingAndSaysWhatAHostDoes) {
     makeRecording("a.json", kTapAndHold);
     const std::string output = outputOf({"host", "--device", "recording:" + path("a.json")});
-    EXPECT_THAT(output, StartsWith(ZORVA_TEST_PLUGIN " 26.0.0: recording @a.json\n"));
+    EXPECT_THAT(output, StartsWith("ZorvaTouchHIDService.so, service version 26.0.0\nrecording @a.json\n"));
     EXPECT_EQ(withoutHeading(output),
               "   time s  gesture         region         ms  host does\n"
               "    0.050  tap             play/pause     50  play/pause\n"
               "    0.610  hold            volume up     510  volume up ...\n"
               "    0.700  hold ends       volume up     600  stop\n"
               "  events        may-begin 2, hold-start 1, hold-end 1, tap 1\n"
-              "  dispatched    numBeginHold 1, numEndHold 1, numIncrementHold 8, numPlayPause 1, numTaps 1, "
-              "numVolumeIncrement 9\n"
-              "  rejected      none\n"
-              "  device        resets 0, disjoint images 0\n");
+              "  recognized    taps 1, taps play/pause 1, holds begun 1, holds ended 1,\n"
+              "                frames of holds 8, frames of holds volume up 9\n");
 }
 
 TEST_F(HostCommand, PlaysARecordingInLinesOfJson) {
@@ -170,8 +188,8 @@ TEST_F(HostCommand, AnUnknownDeviceIsToldWithTheScenarios) {
     EXPECT_EQ(errorOf({"host", "--device", "usb"}),
               "zorvatouch: --device: 'usb' is neither sim:SCENARIO nor recording:FILE; scenarios are " +
                   scenarios);
-    EXPECT_EQ(errorOf({"host", "--device", "sim:tap"}),
-              "zorvatouch: --device: 'tap' is no scenario; there are " + scenarios);
+    EXPECT_EQ(errorOf({"host", "--device", "sim:swipe"}),
+              "zorvatouch: --device: 'swipe' is not a scenario; scenarios are " + scenarios);
 }
 
 TEST_F(HostCommand, OptionsOfADeviceNeedIt) {
@@ -185,15 +203,15 @@ TEST_F(HostCommand, OptionsOfADeviceNeedIt) {
 
 TEST_F(HostCommand, ValuesMustFit) {
     EXPECT_THAT(errorOf({"host", "--device", "sim:taps", "--speed", "0"}),
-                HasSubstr("--speed: '0' is no number above 0 "));
+                HasSubstr("--speed: '0' must be a number > 0 "));
     EXPECT_THAT(errorOf({"host", "--device", "sim:taps", "--seed", "x"}),
-                HasSubstr("--seed: 'x' is no whole number from 0 on "));
+                HasSubstr("--seed: 'x' must be an integer >= 0 "));
     EXPECT_THAT(errorOf({"host", "--device", "sim:taps", "--duration", "0"}),
-                HasSubstr("--duration: '0' is no number from 0.1 to 36000 (s) "));
-    EXPECT_THAT(errorOf({"host", "--set", "Version"}), HasSubstr("--set: 'Version' is not KEY=VALUE "));
-    EXPECT_THAT(errorOf({"host", "--set", "=1"}), HasSubstr("--set: '=1' is not KEY=VALUE "));
+                HasSubstr("--duration: '0' must be a number from 0.1 to 36000 (s) "));
+    EXPECT_THAT(errorOf({"host", "--set", "Version"}), HasSubstr("--set: 'Version' must be KEY=VALUE "));
+    EXPECT_THAT(errorOf({"host", "--set", "=1"}), HasSubstr("--set: '=1' must be KEY=VALUE "));
     EXPECT_THAT(errorOf({"host", "--get", "V", "--log-level", "loud"}),
-                HasSubstr("--log-level: 'loud' is none of debug, default, error "));
+                HasSubstr("--log-level: 'loud' must be debug, default or error "));
 }
 
 TEST_F(HostCommand, APlugInThatIsNotThereIsAnError) {

@@ -22,6 +22,21 @@ TEST(Layout, DecimalsAreRounded) {
     EXPECT_EQ(decimalText(99.994, 2), "99.99");
 }
 
+TEST(Layout, LinesAreWrappedAtEightyColumns) {
+    const auto wrapped = [](const std::string &line, std::size_t column, std::string_view separator) {
+        std::string text;
+        appendWrapped(text, line, column, separator);
+        return text;
+    };
+    const std::string word(39, 'x');
+    EXPECT_EQ(wrapped(word + " " + word + "x", 0, " "), word + " " + word + "x") << "80 columns";
+    EXPECT_EQ(wrapped(word + " " + word + "xx", 0, " "), word + "\n" + word + "xx");
+    EXPECT_EQ(wrapped("a " + word, 40, " "), "a\n" + std::string(40, ' ') + word);
+    EXPECT_EQ(wrapped("many words, few words, none", 60, ", "),
+              "many words,\n" + std::string(60, ' ') + "few words, none");
+    EXPECT_EQ(wrapped(std::string(90, 'x') + " y", 0, " "), std::string(90, 'x') + "\ny") << "stays whole";
+}
+
 TEST(Layout, WidthsCountCharacters) {
     EXPECT_EQ(widthOf("a → b"), 5u); // the arrow has three bytes
     std::string text;

@@ -35,11 +35,12 @@ TEST_F(ReplayTableOutput, HasALineForEachGesture) {
               "       0.060  hold ends        volume up                        60        7        7\n"
               "       0.080  touch withdrawn                                   10                 9\n"
               "       0.080  device reset                                                         9\n"
-              "  events        may-begin 2, hold-start 1, hold-change 1, hold-end 1, cancel 1, reset 1\n"
-              "  dispatched    numBeginHold 1, numEndHold 1, numIncrementHold 2, numKeloCall 1, "
-              "numVolumeIncrement 2\n"
-              "  rejected      numRejectedTap 1, numRejectedVolumeDown 1\n"
-              "  device        resets 1, disjoint images 0\n");
+              "  events        may-begin 2, hold-start 1, hold-change 1, hold-end 1, cancel 1,\n"
+              "                reset 1\n"
+              "  recognized    holds begun 1, holds begun play/pause 1, holds ended 1,\n"
+              "                frames of holds 2, frames of holds volume up 2\n"
+              "  rejected      taps 1, taps volume down 1\n"
+              "  device        resets 1\n");
 }
 
 TEST_F(ReplayTableOutput, SaysThatThereAreNoGestures) {
@@ -47,9 +48,7 @@ TEST_F(ReplayTableOutput, SaysThatThereAreNoGestures) {
     EXPECT_EQ(outputOf({"replay", "@idle.json"}), "@idle.json\n"
                                                   "  no gestures\n"
                                                   "  events        none\n"
-                                                  "  dispatched    none\n"
-                                                  "  rejected      none\n"
-                                                  "  device        resets 0, disjoint images 1\n");
+                                                  "  device        gaps in the images 1\n");
 }
 
 TEST_F(ReplayTableOutput, ATouchThatDoesNotEndIsNoGestureYet) {
