@@ -28,29 +28,42 @@ bool isRefused() noexcept {
     return true;
 }
 
+/// Null if it is refused.
+void *allocate(std::size_t size) noexcept {
+    return isRefused() ? nullptr : std::malloc(size != 0 ? size : 1);
+}
+
+void *allocate(std::size_t size, std::align_val_t alignment) noexcept {
+    const auto step = static_cast<std::size_t>(alignment);
+    const std::size_t rounded = (size + step - 1) / step * step;
+    return isRefused() ? nullptr : std::aligned_alloc(step, rounded != 0 ? rounded : step);
+}
+
 void *orThrow(void *memory) {
     if (!memory)
         throw std::bad_alloc();
     return memory;
 }
 
-void *allocate(std::size_t size) {
-    return orThrow(isRefused() ? nullptr : std::malloc(size != 0 ? size : 1));
-}
-
-void *allocate(std::size_t size, std::align_val_t alignment) {
-    const auto step = static_cast<std::size_t>(alignment);
-    const std::size_t rounded = (size + step - 1) / step * step;
-    return orThrow(isRefused() ? nullptr : std::aligned_alloc(step, rounded != 0 ? rounded : step));
-}
-
 } // namespace
 
-// The forms that must not throw call these.
-void *operator new(std::size_t size) { return allocate(size); }
-void *operator new[](std::size_t size) { return allocate(size); }
-void *operator new(std::size_t size, std::align_val_t alignment) { return allocate(size, alignment); }
-void *operator new[](std::size_t size, std::align_val_t alignment) { return allocate(size, alignment); }
+// Also the forms that do not throw: a sanitizer has some of its own, whose memory must not come here.
+void *operator new(std::size_t size) { return orThrow(allocate(size)); }
+void *operator new[](std::size_t size) { return orThrow(allocate(size)); }
+void *operator new(std::size_t size, std::align_val_t alignment) {
+    return orThrow(allocate(size, alignment));
+}
+void *operator new[](std::size_t size, std::align_val_t alignment) {
+    return orThrow(allocate(size, alignment));
+}
+void *operator new(std::size_t size, const std::nothrow_t &) noexcept { return allocate(size); }
+void *operator new[](std::size_t size, const std::nothrow_t &) noexcept { return allocate(size); }
+void *operator new(std::size_t size, std::align_val_t alignment, const std::nothrow_t &) noexcept {
+    return allocate(size, alignment);
+}
+void *operator new[](std::size_t size, std::align_val_t alignment, const std::nothrow_t &) noexcept {
+    return allocate(size, alignment);
+}
 void operator delete(void *memory) noexcept { std::free(memory); }
 void operator delete[](void *memory) noexcept { std::free(memory); }
 void operator delete(void *memory, std::size_t) noexcept { std::free(memory); }
@@ -59,6 +72,8 @@ void operator delete(void *memory, std::align_val_t) noexcept { std::free(memory
 void operator delete[](void *memory, std::align_val_t) noexcept { std::free(memory); }
 void operator delete(void *memory, std::size_t, std::align_val_t) noexcept { std::free(memory); }
 void operator delete[](void *memory, std::size_t, std::align_val_t) noexcept { std::free(memory); }
+void operator delete(void *memory, const std::nothrow_t &) noexcept { std::free(memory); }
+void operator delete[](void *memory, const std::nothrow_t &) noexcept { std::free(memory); }
 
 namespace ZorvaTouch::Testing {
 
