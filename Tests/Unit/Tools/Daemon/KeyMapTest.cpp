@@ -127,7 +127,7 @@ TEST(KeyMap, ComplainsInOneReadableLine) {
     EXPECT_EQ(problemWith(longAssignment),
               "'" + std::string(40, 'x') + "...' is not a gesture; gestures are tap, hold");
     EXPECT_EQ(problemWith(std::string("t\0p:volume-up=none", 17)),
-              "'t?p' is not a gesture; did you mean 'tap'?");
+              "'t\\x00p' is not a gesture; did you mean 'tap'?");
 }
 
 TEST(NamedKeys, HaveTheKernelsNumbers) {
