@@ -40,7 +40,7 @@ public:
     /// @param format   Called on the log's thread.
     /// @throws std::system_error  The system has no thread to give.
     AsyncLogs(Ports::LogLevel minimum, LogFormat format, std::shared_ptr<TextWriter> writer);
-    /// Writes what waits; a reader that hangs is given up after `AsyncWriter::kPatience`. Handles that are
+    /// Writes what waits; a reader that hangs is given up after a second. Handles that are
     /// left write nothing any more.
     ~AsyncLogs() override;
     AsyncLogs(const AsyncLogs &) = delete;

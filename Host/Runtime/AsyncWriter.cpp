@@ -12,6 +12,11 @@
 #include <utility>
 
 namespace ZorvaTouch::Host {
+namespace {
+
+constexpr std::chrono::milliseconds kPatience{1000}; // how long the end waits for a reader
+
+} // namespace
 
 /// What waits to be written. The thread shares it, so that a write that never ends keeps it.
 ///
@@ -186,6 +191,8 @@ void AsyncWriter::put(std::string line) noexcept try {
 }
 
 void AsyncWriter::drop() noexcept { _state->drop(); }
+
+void AsyncWriter::finish() noexcept { finish(kPatience); }
 
 void AsyncWriter::finish(std::chrono::milliseconds patience) noexcept {
     const std::unique_ptr<Thread> thread = std::exchange(_thread, nullptr);

@@ -22,8 +22,6 @@ namespace ZorvaTouch::Host {
 class AsyncWriter {
 public:
     static constexpr std::size_t kCapacity = 1000;
-    /// How long the end waits for a reader.
-    static constexpr std::chrono::milliseconds kPatience{1000};
 
     /// Makes a line with its line break; called on the writer's thread. May throw std::bad_alloc, and then
     /// the line is lost.
@@ -58,7 +56,9 @@ public:
     /// Writes what waits, and takes nothing any more. A reader that does not take it in time is given up. If
     /// not even that ends the write the thread is left behind, so that this returns after twice the patience
     /// at the latest; what it still does reports to no one.
-    void finish(std::chrono::milliseconds patience = kPatience) noexcept;
+    void finish(std::chrono::milliseconds patience) noexcept;
+    /// With the patience that programs have, a second.
+    void finish() noexcept;
 
 private:
     class State;
