@@ -122,7 +122,7 @@ TEST(OutOfMemory, ASortIsDoneWhollyOrNotAtAll) {
 
 TEST(OutOfMemory, ACopyIsMadeWhollyOrNotAtAll) {
     expectAllOrNothing([](FrameList &list) {
-        const FrameList source = mixedList(70);
+        static const FrameList source = mixedList(70);
         list = source;
     });
 }
