@@ -41,7 +41,7 @@ void demandReadsBack(PipelineRecording &recording) {
     }
 }
 
-/// Any state can be told in words.
+/// Any state can be described as text.
 void demandDescribes(const Pipeline &pipeline) {
     const std::array<std::int16_t, kElectrodeCount> noSignals{};
     ZORVA_MUST(!pipeline.algs().touchStateDescription(noSignals, 0).empty());

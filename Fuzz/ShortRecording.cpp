@@ -74,7 +74,7 @@ void putValue(std::string &bytes, const PropertyValue &value) {
         bytes.back() = 0;
 }
 
-/// Images: time and number of the last one are what the next is told by.
+/// Images: the next one is written as the difference from the time and number of the last.
 class Writer {
 public:
     explicit Writer(std::uint32_t firstTimeMs) {

@@ -272,7 +272,7 @@ FrameList::ChunkRef FrameList::takeChunk() {
 }
 
 void FrameList::giveBack(ChunkRef chunk) noexcept {
-    if (!chunk.isSole() || _spares.size() == _spares.capacity()) // no room is no harm: it is freed
+    if (!chunk.isSole() || _spares.size() == _spares.capacity()) // without room it is freed
         return;
     chunk->clear();
     _spares.push_back(std::move(chunk));

@@ -19,7 +19,7 @@ public:
     [[nodiscard]] std::chrono::milliseconds next() noexcept {
         return std::exchange(_next, std::min(_next * 2, kLongest));
     }
-    /// It works: after the next failure the delays begin anew.
+    /// It works: after the next failure the delays restart at the shortest.
     void reset() noexcept { _next = kFirst; }
 
 private:

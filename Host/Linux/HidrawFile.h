@@ -23,7 +23,7 @@ public:
     [[nodiscard]] int descriptor() const noexcept override { return _descriptor.get(); }
     [[nodiscard]] IoResult read(std::span<std::uint8_t> buffer) noexcept override;
     [[nodiscard]] IoResult deviceNumber(std::uint64_t &stored) noexcept override;
-    /// An advisory lock (`flock`) on the node's inode: it works for whoever may open the node, across users
+    /// An advisory lock (`flock`) on the node's inode: it needs only access to the node, works across users
     /// and containers that share the node, and needs no other file.
     [[nodiscard]] IoResult lock() noexcept override;
     [[nodiscard]] IoResult info(HidrawInfo &stored) noexcept override;

@@ -9,7 +9,7 @@ namespace ZorvaTouch::Linux {
 
 /// Finds out whether a file whose code is to be run may have been exchanged by another user: the file and its
 /// directory must belong to one of the owners, and neither a group (but root's) nor everyone may write to
-/// them. A directory with the sticky bit may be writable: nobody can exchange another user's file there.
+/// them. A directory with the sticky bit may be writable: users cannot exchange files of other users there.
 ///
 /// @return The file's path without links, as it was checked.
 /// @throws std::runtime_error  It does not exist or is not to be trusted, with the reason in one line.

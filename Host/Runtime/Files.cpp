@@ -64,7 +64,7 @@ void writeAndRename(const std::string &target, std::string_view contents, std::o
                     bool isVerified, const std::stop_token &abandoned) {
     const SplitPath path(target);
     const Folder folder(path.folder);
-    // Until it has its permissions nobody else reads what they may keep from others.
+    // Until it has its permissions, other users cannot read what the permissions may hide.
     TemporaryFile file(folder, permissions ? kForTheOwner : kForEverybody);
     file.write(contents, permissions, abandoned);
     if (isVerified)
@@ -155,8 +155,8 @@ void requireReplaceableName(const std::string &path) {
         return requireOurs(path, status);
     if (S_ISDIR(status.st_mode))
         throw FileFailure("replace", EISDIR);
-    throw FileFailure(S_ISLNK(status.st_mode) ? "replace a symbolic link" : "replace what is no regular file",
-                      EPERM);
+    throw FileFailure(
+        S_ISLNK(status.st_mode) ? "replace a symbolic link" : "replace a file that is not regular", EPERM);
 }
 
 void removeLeftovers(const std::string &path) noexcept {

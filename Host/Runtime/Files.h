@@ -49,7 +49,7 @@ struct Input {
 /// Gives a file new contents: they are written to a temporary file of a random name in the same folder,
 /// flushed to the disk and renamed, and the folder is flushed, so that under `path` there is always the whole
 /// old file or the whole new one. An existing file keeps its permissions, a symbolic link keeps pointing at
-/// it. What is no regular file (a pipe, a device) is written to as it is.
+/// it. A pipe or a device is written directly.
 /// @throws FileFailure  The temporary file is gone then.
 void replaceFile(const std::string &path, std::string_view contents);
 

@@ -38,7 +38,7 @@ private:
     std::atomic<std::uint32_t> _references = 1;
 };
 
-/// A value that nobody can read to its end: an array whose one element is itself. Not counted.
+/// A value that cannot be read to its end: an array whose one element is itself. Not counted.
 ///
 /// Threads: any.
 class EndlessValue final : public ZorvaValue {

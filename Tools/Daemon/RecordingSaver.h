@@ -36,7 +36,7 @@ struct SurfaceRecording {
 void requireSavable(std::span<const std::string> files);
 
 /// Saves a recording, for nobody but its owner: it shows what somebody did. An older file is replaced only
-/// when the new one is complete, and has been read again and compared; what is no regular file is not
+/// when the new one is complete, and has been read again and compared; a file that is not regular is not
 /// replaced, nor is a symbolic link followed.
 /// @param mostBytes  A longer file is not written.
 /// @param abandoned  Once it is requested, nothing is saved any more.

@@ -37,7 +37,7 @@ public:
     void play();
 
 private:
-    /// Who is notified of the device's reports, since the device itself notifies nobody.
+    /// Receives the device's reports, which the device itself does not report.
     class Observers;
 
     [[nodiscard]] Simulated::FrameSource frames();

@@ -31,7 +31,7 @@ class HostedService {
 public:
     /// Makes a service.
     /// @param plugIn  Kept as long as the service.
-    /// @throws HostingError  The file is no plug-in with such a service.
+    /// @throws HostingError  The file is not a plug-in with such a service.
     explicit HostedService(std::shared_ptr<const Host::PlugInFile> plugIn);
     ~HostedService();
     HostedService(const HostedService &) = delete;

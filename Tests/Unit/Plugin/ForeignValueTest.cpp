@@ -201,7 +201,7 @@ TEST(ForeignValue, IsReadWithSixtyFourLevelsAndRefusedWithOneMore) {
     EXPECT_EQ(refusalOf(arrays.front()), kTooDeep);
 }
 
-/// With a count of 2^64-1, unless told otherwise, and the same at each place.
+/// With a count of 2^64-1 (default), and the same at each place.
 ForeignValue uniform(std::uint32_t kind, const char *everyKey, const ZorvaValue *everyElement,
                      std::size_t count = SIZE_MAX) {
     ForeignValue value(kind);

@@ -151,9 +151,9 @@ TEST_F(Files, APrivateFileReplacesNothingButFiles) {
     EXPECT_EQ(failureOf([this] { replacePrivateFile(path("loose"), "2"); }),
               "replace a symbolic link: Operation not permitted");
     EXPECT_EQ(failureOf([this] { replacePrivateFile(path("pipe"), "2"); }),
-              "replace what is no regular file: Operation not permitted");
+              "replace a file that is not regular: Operation not permitted");
     EXPECT_EQ(failureOf([] { replacePrivateFile("/dev/null", "2"); }),
-              "replace what is no regular file: Operation not permitted");
+              "replace a file that is not regular: Operation not permitted");
     EXPECT_EQ(failureOf([this] { replacePrivateFile(_folder, "2"); }), "replace: Is a directory");
     EXPECT_EQ(failureOf([this] { replacePrivateFile(path("no/a"), "2"); }),
               "open a temporary file beside it: No such file or directory");

@@ -53,7 +53,7 @@ TEST_F(KeyQuarantineTest, EndsWithTheFirstPressAfterTheQuietPeriod) {
     for (int i = 0; i < 3; ++i)
         static_cast<void>(tap(0));
     EXPECT_THAT(tap(10), ElementsAre("begins"));
-    EXPECT_THAT(tap(2009), IsEmpty()); // 1999 ms later: not quiet yet, and it starts anew
+    EXPECT_THAT(tap(2009), IsEmpty()); // 1999 ms later: not quiet yet, and the quiet period restarts
     EXPECT_THAT(tap(4008), IsEmpty());
     EXPECT_EQ(quarantine.suppressed(), 3u);
     EXPECT_THAT(tap(6008), ElementsAre("+115", "-115", "ends"));

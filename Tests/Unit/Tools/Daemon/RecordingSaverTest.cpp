@@ -91,7 +91,7 @@ TEST_F(RecordingSaver, FailuresAreOneLine) {
               "@/no/a.json: cannot open a temporary file beside it: No such file or directory");
     EXPECT_EQ(problemWith(_folder, kTwoReports), "@: cannot replace: Is a directory");
     EXPECT_EQ(problemWith("/dev/full", kTwoReports),
-              "/dev/full: cannot replace what is no regular file: Operation not permitted");
+              "/dev/full: cannot replace a file that is not regular: Operation not permitted");
 }
 
 TEST_F(RecordingSaver, ALinkIsNotFollowed) {
@@ -114,7 +114,7 @@ public:
         if (_thread.joinable())
             _thread.join();
     }
-    /// Readers that were found waiting for somebody to open the FIFO for writing.
+    /// Readers that were found blocked until the FIFO is opened for writing.
     [[nodiscard]] unsigned caught() const noexcept { return _caught; }
 
 private:
@@ -133,7 +133,7 @@ private:
         struct stat status {};
         return ::lstat(path.c_str(), &status) == 0 && S_ISFIFO(status.st_mode);
     }
-    /// Opens a FIFO for writing, which fails unless somebody waits in its opening for reading.
+    /// Opens a FIFO for writing, which fails unless a reader is blocked in its open call.
     void release(const std::string &path) {
         const int number = ::open(path.c_str(), O_WRONLY | O_NONBLOCK | O_NOFOLLOW | O_CLOEXEC);
         if (number < 0)
