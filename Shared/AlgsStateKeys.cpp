@@ -161,7 +161,7 @@ std::span<const std::string_view> writableStateKeys() {
         std::array<std::string_view, kTunables.size() + 2> keys{};
         for (std::size_t i = 0; i < kTunables.size(); ++i)
             keys[i] = kTunables[i].key;
-        keys[kTunables.size()] = "VirtualNormalizationFactors.N";
+        keys[kTunables.size()] = "VirtualNormalizationFactors.0 to .22";
         keys[kTunables.size() + 1] = kResetEventStatsKey;
         return keys;
     }();

@@ -31,7 +31,8 @@ struct StateRange {
 /// for any other key.
 [[nodiscard]] std::optional<StateRange> stateRange(std::string_view key);
 
-/// The names of all keys that can be written; "VirtualNormalizationFactors.N" stands for the 23 factors.
+/// The names of all keys that can be written; "VirtualNormalizationFactors.0 to .22" stands for the 23
+/// factors.
 [[nodiscard]] std::span<const std::string_view> writableStateKeys();
 
 } // namespace ZorvaTouch

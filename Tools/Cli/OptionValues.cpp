@@ -9,7 +9,6 @@
 
 #include <array>
 #include <charconv>
-#include <utility>
 
 namespace ZorvaTouch::Tools {
 namespace {
@@ -40,19 +39,22 @@ constexpr std::array<LogLevelName, 3> kLogLevelNames{{{"debug", Ports::LogLevel:
 constexpr std::string_view kPipelineDomain = "Pipeline";
 constexpr std::string_view kRecognizerDomain = "Algs";
 
-/// A value as it was typed, or nearly so.
-std::string shownValue(const PropertyValue &value) {
-    const std::string *const text = value.asString();
-    return text ? *text : Util::jsonText(value);
-}
+/// KEY=VALUE as it was typed; borrowed from the option's text.
+struct TypedSetting {
+    std::string_view key;
+    std::string_view value;
 
-/// KEY=VALUE, the key as it stands.
-Setting splitSetting(std::string_view text) {
+    /// The value as JSON, or else as a text.
+    [[nodiscard]] PropertyValue parsedValue() const {
+        return Util::parseJson(value).value_or(PropertyValue(value));
+    }
+};
+
+TypedSetting splitSetting(std::string_view text) {
     const std::size_t sign = text.find('=');
     if (sign == std::string_view::npos)
         refuse("--set", text, " must be KEY=VALUE");
-    const std::string_view value = text.substr(sign + 1);
-    return {std::string(text.substr(0, sign)), Util::parseJson(value).value_or(PropertyValue(value))};
+    return {text.substr(0, sign), text.substr(sign + 1)};
 }
 
 std::string joined(std::span<const std::string_view> names) {
@@ -70,17 +72,18 @@ std::string recognizerKey(std::string_view key) {
     return rest;
 }
 
-/// @param setting  With the recognizer's key.
-/// @param key      As it was typed.
+/// The setting with the recognizer's key.
 /// @throws CliError  The key cannot be written, or the value is not one for it.
-void requireState(const Setting &setting, const std::string &key) {
+Setting stateSetting(const TypedSetting &typed) {
+    Setting setting{recognizerKey(typed.key), typed.parsedValue()};
     const auto range = stateRange(setting.key);
     if (!range)
-        refuse("--set", key,
+        refuse("--set", typed.key,
                " is not a writable state key" + suggestion(setting.key, writableStateKeys(),
                                                            "; writable are " + joined(writableStateKeys())));
     if (!range->contains(setting.value))
-        refuse("--set " + key, shownValue(setting.value), " must be " + range->text());
+        refuse("--set " + std::string(typed.key), typed.value, " must be " + range->text());
+    return setting;
 }
 
 } // namespace
@@ -142,23 +145,18 @@ std::string numberText(double value) {
     return text.ends_with(".0") ? text.substr(0, text.size() - 2) : text;
 }
 
-Setting parseSetting(std::string_view text) {
-    Setting setting = splitSetting(text);
-    const std::string key = std::exchange(setting.key, recognizerKey(setting.key));
-    requireState(setting, key);
-    return setting;
-}
+Setting parseSetting(std::string_view text) { return stateSetting(splitSetting(text)); }
 
 Setting parseProperty(std::string_view text) {
-    Setting setting = splitSetting(text);
-    if (setting.key.empty())
+    const TypedSetting typed = splitSetting(text);
+    if (typed.key.empty())
         refuse("--set", text, " must be KEY=VALUE");
-    std::string rest = setting.key;
+    std::string rest(typed.key);
     if (Util::stripDomainFromKey(rest, kPipelineDomain))
-        requireState({recognizerKey(setting.key), setting.value}, setting.key);
+        static_cast<void>(stateSetting(typed));
     else if (stateRange(rest))
         refuse("--set", rest, " is a state key; with its domains it is Pipeline.Algs." + rest);
-    return setting;
+    return {std::string(typed.key), typed.parsedValue()};
 }
 
 } // namespace ZorvaTouch::Tools

@@ -7,7 +7,7 @@
 namespace ZorvaTouch::Tools {
 namespace {
 
-constexpr std::size_t kLongestWord = 64; ///< nobody misspells a longer one; bounds the work
+constexpr std::size_t kLongestWord = 64; ///< a longer word is not a misspelling; bounds the work
 
 char lowered(char c) { return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c; }
 

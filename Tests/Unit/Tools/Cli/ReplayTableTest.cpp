@@ -138,13 +138,6 @@ TEST_F(ReplayTableOutput, OfSeveralStatesWithOneKeyTheLastWins) {
                 HasSubstr("  hold  "));
 }
 
-TEST_F(ReplayTableOutput, AStateThatIsNoJsonIsAString) {
-    // A string is no number and counts as 0.
-    makeRecording("touch.json", "touch A=300 for 40ms\nidle");
-    EXPECT_THAT(outputOf({"replay", "--set", "HoldTimeoutMilliseconds=twenty", "@touch.json"}),
-                HasSubstr("       0.010  hold  ")); // 10 ms are longer than 0 ms
-}
-
 TEST_F(ReplayTableOutput, PausesAsRecordedDividedByTheSpeed) {
     makeRecording("slow.json", "idle\nidle\nwait 40ms\nidle");
     EXPECT_EQ(outputOf({"replay", "@slow.json", "--speed", "2"}), outputOf({"replay", "@slow.json"}));

@@ -120,7 +120,7 @@ TEST_F(Usage, CommandsTakeNoOtherArguments) {
 TEST_F(Usage, ValuesMustFit) {
     const std::string kWritable = "; writable are EnableHoldSuppression, EnableTapSuppression, "
                                   "ActivationThreshold, HoldTimeoutMilliseconds, "
-                                  "VirtualNormalizationFactors.N, ResetEventStats";
+                                  "VirtualNormalizationFactors.0 to .22, ResetEventStats";
     const auto problem = [this](std::initializer_list<std::string> arguments) {
         const std::string text = errorOf(arguments);
         return text.substr(12, text.find(" (see ") - 12);
@@ -164,13 +164,13 @@ TEST_F(Usage, StateValuesMustBeInTheirRange) {
     EXPECT_EQ(problem("HoldTimeoutMilliseconds=abc"),
               "HoldTimeoutMilliseconds: 'abc' must be an integer from 0 to 4294967295");
     EXPECT_EQ(problem("HoldTimeoutMilliseconds=-5"),
-              "HoldTimeoutMilliseconds: '-5.0' must be an integer from 0 to 4294967295");
+              "HoldTimeoutMilliseconds: '-5' must be an integer from 0 to 4294967295");
     EXPECT_EQ(problem("HoldTimeoutMilliseconds=0.5"),
               "HoldTimeoutMilliseconds: '0.5' must be an integer from 0 to 4294967295");
     EXPECT_EQ(problem("HoldTimeoutMilliseconds=4294967296"),
               "HoldTimeoutMilliseconds: '4294967296' must be an integer from 0 to 4294967295");
     EXPECT_EQ(problem("ActivationThreshold=-1"),
-              "ActivationThreshold: '-1.0' must be a number from 0 to 100000");
+              "ActivationThreshold: '-1' must be a number from 0 to 100000");
     EXPECT_EQ(problem("ActivationThreshold=true"),
               "ActivationThreshold: 'true' must be a number from 0 to 100000");
     EXPECT_EQ(problem("EnableTapSuppression=off"), "EnableTapSuppression: 'off' must be true or false");
