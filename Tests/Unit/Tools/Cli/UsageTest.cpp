@@ -142,7 +142,8 @@ TEST_F(Usage, ValuesMustFit) {
     EXPECT_EQ(problem({"replay", "a", "--set", "Algs.Pipeline.ActivationThreshold=1"}),
               "--set: 'Algs.Pipeline.ActivationThreshold' is not a writable state key" + kWritable);
     EXPECT_EQ(problem({"replay", "a", "--set", "VirtualNormalizationFactors.23=1"}),
-              "--set: 'VirtualNormalizationFactors.23' is not a writable state key" + kWritable);
+              "--set: 'VirtualNormalizationFactors.23' is not a writable state key; "
+              "did you mean 'VirtualNormalizationFactors.0 to .22'?");
     EXPECT_EQ(problem({"trim", "a", "b", "--max", "0"}), "--max: '0' must be an integer >= 1");
     EXPECT_EQ(problem({"trim", "a", "b", "--max", "0x10"}), "--max: '0x10' must be an integer >= 1");
     EXPECT_EQ(problem({"show", "a", "--frame", "-1"}), "--frame: '-1' must be an integer >= 0");
