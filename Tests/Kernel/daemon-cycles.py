@@ -12,6 +12,7 @@ from lab import Emulated, expect, fail
 
 CYCLES = 200
 SHOWN = (20, 100, 200)
+WARM = 100     # by then every recording has been replaced, and the allocator has what the save thread needs
 HASTY_CYCLES = 50
 PACE_MS = 1    # the sensor's clock decides what a hold is
 
@@ -82,10 +83,10 @@ def main():
             print(f"   {cycle:5}  {footprints[cycle][0]:11}  {footprints[cycle][1]:7}  {footprints[cycle][2]:10}")
         surface.plug()
         daemon.hear_surface("opened")
-    early, late = footprints[SHOWN[0]], footprints[SHOWN[-1]]
+    early, late = footprints[WARM], footprints[CYCLES]
     expect("no descriptor is left behind", early[0], late[0])
     expect("no thread", early[1], late[1])
-    expect("and no memory, by one part in twenty", True, late[2] <= early[2] * 1.05)
+    expect("and no memory, by one part in fifty", True, late[2] <= early[2] * 1.02)
     print(f"ok: no key was down when the surface was gone; {len(keys.changes())} went down or up")
     expect_tap(surface, keys)
     check_haste(daemon, keys, surface)

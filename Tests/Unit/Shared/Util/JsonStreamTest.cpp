@@ -102,7 +102,7 @@ TEST(JsonStream, CountsTheLevelsThatWereEntered) {
     const auto nested = [](std::size_t depth) {
         return std::string(depth, '[') + "1" + std::string(depth, ']');
     };
-    for (const std::size_t entered : {0, 1, 2, 63}) {
+    for (const std::size_t entered : {0U, 1U, 2U, 63U}) {
         EXPECT_NO_THROW(static_cast<void>(stepped(piecesOf(nested(64)), entered))) << entered;
         EXPECT_THROW(static_cast<void>(stepped(piecesOf(nested(65)), entered)), JsonError) << entered;
     }
