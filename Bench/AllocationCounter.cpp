@@ -34,6 +34,14 @@ void *allocate(std::size_t size, std::align_val_t alignment) {
     return counted(std::aligned_alloc(step, rounded != 0 ? rounded : step));
 }
 
+template <typename Allocation> void *withoutThrowing(const Allocation &allocation) noexcept {
+    try {
+        return allocation();
+    } catch (const std::bad_alloc &) {
+        return nullptr;
+    }
+}
+
 void release(void *memory) noexcept {
     if (isCounting.load(std::memory_order_relaxed))
         allocatedBytes.fetch_sub(usableBytes(memory), std::memory_order_relaxed);
@@ -42,11 +50,25 @@ void release(void *memory) noexcept {
 
 } // namespace
 
-// The forms that must not throw call these.
 void *operator new(std::size_t size) { return allocate(size); }
 void *operator new[](std::size_t size) { return allocate(size); }
 void *operator new(std::size_t size, std::align_val_t alignment) { return allocate(size, alignment); }
 void *operator new[](std::size_t size, std::align_val_t alignment) { return allocate(size, alignment); }
+// The forms that must not throw. The library's own call the ones above; a sanitizer's do not.
+void *operator new(std::size_t size, const std::nothrow_t &) noexcept {
+    return withoutThrowing([&] { return allocate(size); });
+}
+void *operator new[](std::size_t size, const std::nothrow_t &) noexcept {
+    return withoutThrowing([&] { return allocate(size); });
+}
+void *operator new(std::size_t size, std::align_val_t alignment, const std::nothrow_t &) noexcept {
+    return withoutThrowing([&] { return allocate(size, alignment); });
+}
+void *operator new[](std::size_t size, std::align_val_t alignment, const std::nothrow_t &) noexcept {
+    return withoutThrowing([&] { return allocate(size, alignment); });
+}
+void operator delete(void *memory, const std::nothrow_t &) noexcept { release(memory); }
+void operator delete[](void *memory, const std::nothrow_t &) noexcept { release(memory); }
 void operator delete(void *memory) noexcept { release(memory); }
 void operator delete[](void *memory) noexcept { release(memory); }
 void operator delete(void *memory, std::size_t) noexcept { release(memory); }

@@ -15,14 +15,14 @@ OpenedNode refusal(int errorNumber, const char *detail) noexcept {
     return {.node = nullptr, .errorNumber = errorNumber, .detail = detail};
 }
 
-/// @param errorNumber  Of the call that does not work: a device that is just going fails with ENODEV.
 OpenedNode lock(OpenedNode opened) noexcept {
     const int errorNumber = opened.node->lock().errorNumber;
     if (errorNumber == EWOULDBLOCK)
         return refusal(EBUSY, "in use by another program");
-    return errorNumber == 0 ? opened : refusal(errorNumber, nullptr);
+    return errorNumber == 0 ? std::move(opened) : refusal(errorNumber, nullptr);
 }
 
+/// @param errorNumber  Of the call that failed: a device that is being removed fails with ENODEV.
 OpenedNode notHidraw(int errorNumber) noexcept {
     if (errorNumber == ENODEV)
         return refusal(ENODEV, nullptr);

@@ -27,17 +27,17 @@ std::string droppedText(std::uint64_t records) {
 /// Threads: any.
 class AsyncLogs::Output {
 public:
-    Output(const LogFormat &format, std::shared_ptr<TextWriter> writer)
-        : _format(format), _writer("zorva-log", std::move(writer),
-                                   [format](std::uint64_t records) {
-                                       const std::string text = droppedText(records);
-                                       return format({.time = std::chrono::system_clock::now(),
-                                                      .level = Ports::LogLevel::Error,
-                                                      .subsystem = kLogSubsystem,
-                                                      .category = "Log",
-                                                      .text = text});
-                                   },
-                                   {}) {}
+    Output(LogFormat format, std::shared_ptr<TextWriter> writer)
+        : _format(std::move(format)), _writer("zorva-log", std::move(writer),
+                                              [format = _format](std::uint64_t records) {
+                                                  const std::string text = droppedText(records);
+                                                  return format({.time = std::chrono::system_clock::now(),
+                                                                 .level = Ports::LogLevel::Error,
+                                                                 .subsystem = kLogSubsystem,
+                                                                 .category = "Log",
+                                                                 .text = text});
+                                              },
+                                              {}) {}
 
     /// @param origin  The handle's, as it must outlive the record.
     void put(const std::shared_ptr<const std::pair<std::string, std::string>> &origin, Ports::LogLevel level,
@@ -82,7 +82,7 @@ private:
 };
 
 AsyncLogs::AsyncLogs(Ports::LogLevel minimum, LogFormat format, std::shared_ptr<TextWriter> writer)
-    : _minimum(minimum), _output(std::make_shared<Output>(format, std::move(writer))) {}
+    : _minimum(minimum), _output(std::make_shared<Output>(std::move(format), std::move(writer))) {}
 
 AsyncLogs::~AsyncLogs() { _output->finish(); }
 

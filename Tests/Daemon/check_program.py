@@ -138,9 +138,8 @@ class Usage(unittest.TestCase):
             self.assertEqual(daemon.end_by(signal.SIGTERM)[0], 0)
 
     def test_a_thread_that_cannot_be_made_is_named_with_its_limit(self):
-        def limit():  # the first thread's stack does not fit
-            resource.setrlimit(resource.RLIMIT_STACK, (1 << 30, resource.getrlimit(resource.RLIMIT_STACK)[1]))
-            resource.setrlimit(resource.RLIMIT_AS, (1 << 29, 1 << 29))
+        def limit():  # the stack of the first thread is larger than what an address can name
+            resource.setrlimit(resource.RLIMIT_STACK, (1 << 47, resource.getrlimit(resource.RLIMIT_STACK)[1]))
 
         done = run(*FINGER, preexec_fn=limit)
         self.assertEqual((done.returncode, done.stdout), (1, ""), done.stderr)
