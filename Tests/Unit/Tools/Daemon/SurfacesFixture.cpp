@@ -99,7 +99,8 @@ std::vector<Bytes> TouchScript::tapPlay() {
 
 // --- Surfaces ----------------------------------------------------------------------------------------------
 
-SurfacesFixture::SurfacesFixture() {
+SurfacesFixture::SurfacesFixture(std::shared_ptr<Ports::LogProvider> other)
+    : logProvider(other ? std::move(other) : logs) {
     keyQueue.drain(); // its thread runs, for whose start a sanitizer opens a descriptor
     surfaces.emplace(
         SurfaceSurroundings{.plugIn = openPlugIn(ZORVA_TEST_PLUGIN),
@@ -109,7 +110,7 @@ SurfacesFixture::SurfacesFixture() {
                             .keyMap = KeyMap(),
                             .listener = told,
                             .loop = loop,
-                            .log = DaemonLog(*logs, "Surfaces"),
+                            .log = DaemonLog(*logProvider, "Surfaces"),
                             .after = timers.timer()},
         [this](const Linux::DeviceIdentity &device) { return makerOf(device); }, clock,
         SurfaceHooks{.onComing = [this](const SurfaceName &name) { came.push_back(name.id); },

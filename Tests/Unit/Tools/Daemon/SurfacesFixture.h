@@ -88,7 +88,9 @@ private:
 /// says so.
 class SurfacesFixture : public testing::Test {
 protected:
-    SurfacesFixture();
+    SurfacesFixture() : SurfacesFixture(nullptr) {}
+    /// @param other  Where everything is logged instead of `logs`; null: there.
+    explicit SurfacesFixture(std::shared_ptr<Ports::LogProvider> other);
     ~SurfacesFixture() override;
 
     /// A device as the system tells of it, "/dev/hidrawN".
@@ -114,14 +116,15 @@ protected:
     void fireSilence();
 
     const std::shared_ptr<JournalOfLogs> logs = std::make_shared<JournalOfLogs>();
+    const std::shared_ptr<Ports::LogProvider> logProvider;
     Simulated::VirtualClock clock;
-    SessionPlatform platform{logs, &clock};
+    SessionPlatform platform{logProvider, &clock};
     Linux::MainLoop loop;
     ManualTimers timers{loop};
     ListenerJournal told;
     FakeKeyboards keys;
     Host::SerialQueue keyQueue{"zorva-keys"};
-    Keyboard keyboard{keys.maker(), told, DaemonLog(*logs, "Keys")};
+    Keyboard keyboard{keys.maker(), told, DaemonLog(*logProvider, "Keys")};
     const std::shared_ptr<Host::EventSystem> events = Host::EventSystem::create();
     std::map<std::string, Linux::Tests::FakeOpener> openers;     ///< by node
     std::map<std::string, Ref<Linux::HidrawDevice>> lastDevices; ///< by node, if `keepsDevices`

@@ -1,7 +1,10 @@
 #include "Tests/Unit/Tools/Daemon/SurfacesFixture.h"
 
+#include "Host/Linux/Journal.h"
 #include "Host/Objects/Accelerometer.h"
+#include "Host/Runtime/AsyncLogs.h"
 #include "Host/Simulated/Device.h"
+#include "Tests/Unit/Host/Linux/JournalSocket.h"
 #include <gmock/gmock.h>
 
 #include <cerrno>
@@ -29,6 +32,8 @@ using Tests::TouchScript;
 
 class SurfacesTest : public Tests::SurfacesFixture {
 protected:
+    using SurfacesFixture::SurfacesFixture;
+
     /// A surface with the serial number SN1 at /dev/hidraw1 and a key of its that is down.
     void holdOne() {
         surfaces->onAdded(identity(1, "SN1"));
@@ -494,6 +499,43 @@ TEST_F(SurfacesTest, AKeyGoesUpWhenTheDeviceIsSilentInTheMiddleOfAHold) {
     EXPECT_THAT(keys.down(), IsEmpty());
     EXPECT_EQ(logs->lines().count("silent in the middle of a hold"), 1u);
     EXPECT_FALSE(timers.isWatchingSilence());
+}
+
+/// Everything is logged, at level debug, to a journal that is full and does not read.
+class SurfacesWithAStalledJournal : public SurfacesTest {
+protected:
+    SurfacesWithAStalledJournal() : SurfacesTest(std::make_shared<StalledLogs>()) {}
+
+private:
+    class StalledLogs final : public Ports::LogProvider {
+    public:
+        StalledLogs() {
+            for (std::size_t i = 0; i < 2 * Host::AsyncWriter::kCapacity; ++i)
+                openLog("s", "c")->write(Ports::LogLevel::Error, "full");
+            _journal.waitUntilFull();
+        }
+        std::shared_ptr<Ports::Log> openLog(std::string_view subsystem, std::string_view category) override {
+            return _logs.openLog(subsystem, category);
+        }
+
+    private:
+        Linux::Tests::JournalSocket _journal;
+        Host::AsyncLogs _logs{Ports::LogLevel::Debug, Linux::journalFormat(),
+                              std::make_shared<Linux::JournalWriter>(_journal.path())};
+    };
+};
+
+TEST_F(SurfacesWithAStalledJournal, AKeyGoesUpWhenTheDeviceIsSilent) {
+    holdOne();
+    fireSilence();
+    EXPECT_THAT(keys.down(), IsEmpty());
+}
+
+TEST_F(SurfacesWithAStalledJournal, AKeyGoesUpBeforeTheMachineSleeps) {
+    holdOne();
+    surfaces->suspend();
+    keyQueue.drain();
+    EXPECT_THAT(keys.down(), IsEmpty());
 }
 
 TEST_F(SurfacesTest, AKeyStaysDownAsLongAsReportsCome) {
