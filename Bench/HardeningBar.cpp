@@ -13,7 +13,7 @@ constexpr int kRounds = 21;
 
 using Work = decltype(zorvaBenchWork);
 
-/// The function of one of the two modules, which stays loaded; null if there is no such file.
+/// The function of one of the two modules, which stays loaded; null if the file does not exist.
 Work *load(const std::string &path) {
     void *module = dlopen(path.c_str(), RTLD_NOW | RTLD_LOCAL);
     return module == nullptr ? nullptr : reinterpret_cast<Work *>(dlsym(module, "zorvaBenchWork"));

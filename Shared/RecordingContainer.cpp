@@ -192,7 +192,7 @@ std::string versionText(const PropertyValue &version) {
     return text;
 }
 
-/// The known version that a container's member gives; null if there is no such member.
+/// The known version that a container's member gives; null if the member is missing.
 /// @param written  The number as it is written in the text; empty if it is only known as a value.
 std::uint64_t versionFrom(const PropertyValue *version, std::string_view written = {}) {
     if (!version || !(version->asUnsigned() || version->asDouble())) // a boolean is no number here

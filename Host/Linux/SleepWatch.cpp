@@ -149,7 +149,7 @@ private:
     // --- Who logind is -------------------------------------------------------------------------------------
 
     void ownerFound(sd_bus_message *reply) {
-        if (isConnected()) // a bus that answers; one that only accepts is no reason to hurry
+        if (isConnected()) // only a bus that answers resets the back-off
             _backOff.reset();
         const char *owner = "";
         if (!::sd_bus_message_is_method_error(reply, nullptr) &&
@@ -266,7 +266,7 @@ private:
     const Function _onSleep, _onWake;
     const LoopTimer _after;
     BackOff _backOff;
-    LoopWatch _retry;    ///< while there is no bus
+    LoopWatch _retry;    ///< until the bus is connected
     std::string _owner;  ///< logind's name on the bus; empty: it is not there
     UniqueFd _inhibitor; ///< logind waits as long as it is open
     bool _isAsleep = false;

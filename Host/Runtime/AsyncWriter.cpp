@@ -63,7 +63,7 @@ public:
 
     void giveUp() noexcept { _writer->giveUp(); }
 
-    /// The thread is left behind: whoever was to be notified of a failure may be gone.
+    /// The thread is left behind: the object that `_failed` notifies may be destroyed.
     void abandon() noexcept {
         const MutexLock lock(_mutex);
         _isAbandoned = true;
@@ -107,7 +107,7 @@ private:
                 return;
     }
 
-    /// The next one to write; nothing if there is none, and then the thread sleeps.
+    /// The next one to write; nothing if the queue is empty, and then the thread sleeps.
     [[nodiscard]] std::optional<Entry> next() noexcept {
         const MutexLock lock(_mutex);
         if (!_waiting.empty()) {
